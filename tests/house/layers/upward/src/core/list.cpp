@@ -1,0 +1,1 @@
+#include <ZT/directive.h>
