@@ -57,11 +57,19 @@ def check_paths_in_readme(root):
             yield f"README.md: {name} does not exist"
 
 
+def check_program_in_readme(root):
+    shown = re.search(r"```cpp\n(.*?)```",
+                      (root / "README.md").read_text(encoding="utf-8"), re.S)
+    program = (root / "examples/hello.cpp").read_text(encoding="utf-8")
+    if shown is None or shown.group(1) != program:
+        yield "README.md: the program shown is not examples/hello.cpp"
+
+
 def main():
     root = pathlib.Path(sys.argv[1])
     faults = [fault
               for check in (check_sizes, check_guards, check_rooms,
-                            check_paths_in_readme)
+                            check_paths_in_readme, check_program_in_readme)
               for fault in check(root)]
     print("\n".join(faults) or "house: all well")
     return 1 if faults else 0
