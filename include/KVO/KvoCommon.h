@@ -22,7 +22,7 @@
 ///
 /// Units:   `extra` in bytes; below 0 counts as 0.
 /// Owner:   the caller, who frees it with `delete[]`.
-/// Returns: the copy, never null.
+/// Returns: the copy; null only when there is no memory.
 ZT_API char* KvoNewString(const char* text, int extra = 0);
 
 /// Wraps `text` in `open` and `close` if it needs quoting.
@@ -32,7 +32,7 @@ ZT_API char* KvoNewString(const char* text, int extra = 0);
 ///
 /// Owner:   `text` itself when nothing is needed; otherwise a temporary
 ///          string that lives through 99 further ones.
-/// Returns: the text, quoted or as it was.
+/// Returns: the text, quoted or as it was, never null.
 ZT_API const char* KvoQuote(const char* text, char open, char close,
                             const char* specials);
 
