@@ -13,6 +13,8 @@
 #include <ZT/common.h>
 
 #include <iosfwd>
+#include <memory>
+#include <string_view>
 
 /// A path as the list of its names and of the slashes between them.
 ///
@@ -128,10 +130,11 @@ private:
     void append_slash();
     void append_part(const char* name);
     const char* last_part() const;
-    const char* text_of(int parts, const char* more, std::size_t bytes) const;
+    const char* extension_part() const;
     int parts_meant(int parts) const;
-    void extend_last_part(std::size_t kept, const char* extension);
-    void append_extension(const char* extension);
+    std::unique_ptr<char[]> parts_joined(int parts) const;
+    const char* text_of(int parts) const;
+    void put_extension(std::string_view root, const char* extension);
     void read_text(const char* text);
 };
 
