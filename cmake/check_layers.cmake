@@ -20,11 +20,12 @@ set(may_include_image env diag core platform)
 set(may_include_host platform core diag command env time geometry sound image)
 set(rooms platform core diag command env time geometry sound image host)
 
-# The room that each public header belongs to.
+# The room that each public header belongs to. ZT/signals is defined in diag,
+# but stands as low as ZT/util, which shows it to hosts.
 set(headers_core KVO/KvoCommon KVO/KvoObject KVO/KvoArray KVO/KvoObjArr
     KVO/KvoList KVO/KvoObjList KVO/KvoSkipList ZT/common ZT/util ZT/skip
-    ZT/object ZT/array ZT/objarr ZT/list ZT/objlist ZT/keylist)
-set(headers_diag ZT/error ZT/signals)
+    ZT/object ZT/array ZT/objarr ZT/list ZT/objlist ZT/keylist ZT/signals)
+set(headers_diag ZT/error)
 set(headers_command KVO/KvoToken KVO/KvoStatement ZT/token ZT/statement
     ZT/directive ZT/property)
 set(headers_env ZT/filepath KVO/KvoPrefs ZT/plug)

@@ -12,6 +12,7 @@
 /// nor in a signal handler.
 
 #include <ZT/common.h>
+#include <ZT/signals.h>
 
 /// Copies `text` into a string of its own with room for `extra` more
 /// characters.
