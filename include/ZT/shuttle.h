@@ -164,7 +164,7 @@ private:
     void set_forward_range();
     void set_backward_range();
     void end_restarted_play();
-    double fraction_played() const;
+    float fraction_played();
     void jump_to(int index);
 };
 
