@@ -7,7 +7,7 @@
 class Greeter : public ZtDirector
 {
 public:
-    explicit Greeter(ZtDispatcher& dispatcher) : ZtDirector(dispatcher)
+    explicit Greeter(ZtDispatcher& host) : ZtDirector(host)
     {
         AddDirective(0, "Greet");
     }
