@@ -19,16 +19,16 @@ class KvoObject;
 /// Names a class and its direct bases, so that an object can be asked at run
 /// time what it is.
 ///
-/// Records live for the whole process and are never freed. A record that is
-/// initialised statically is ready before any code runs.
+/// Records live for the whole process and are never freed. Those that the
+/// macros below define are ready before any code runs.
 class ZT_API KvoClassInfo
 {
 public:
     /// Makes a record for the class `class_name`.
     ///
-    /// Owner: a record made at run time keeps a copy of `class_name`, a static
-    ///        one points at it; `base_records` is not copied, ends with null
-    ///        and must outlive the record. Null means no base.
+    /// Owner: a record made at run time keeps a copy of `class_name`, a
+    ///        constant points at it; `base_records` is not copied, ends with
+    ///        null and must outlive the record. Null means no base.
     constexpr KvoClassInfo(const char* class_name, KvoClassInfo** base_records)
         : name(__builtin_is_constant_evaluated() ? const_cast<char*>(class_name)
                                                  : KvoNewString(class_name)),
@@ -70,17 +70,18 @@ public:
     KvoClassInfo* ClassInfo() override
 
 /// Defines the class information of `Class`. The further arguments, at least
-/// one, are the addresses of the direct bases' records. Everything is constant,
-/// so the record is ready before any code runs; the macro asserts it.
+/// one, are the addresses of the direct bases' records.
+///
+/// The record is copied from a constant, so that it is ready before any code
+/// runs; compilers may leave the construction of a variable for later.
 #define KVO_DEFINE_CLASS_INFO(Class, ...)                                      \
     static KvoClassInfo* Class##_base[] = {__VA_ARGS__, nullptr};              \
-    KvoClassInfo Class::classInfo(#Class, Class##_base);                       \
+    static constexpr KvoClassInfo Class##_record(#Class, Class##_base);        \
     KvoClassInfo* Class::ClassInfo()                                           \
     {                                                                          \
         return &Class::classInfo;                                              \
     }                                                                          \
-    static_assert(KvoClassInfo(#Class, Class##_base).bases == Class##_base,    \
-                  "the record is a constant")
+    KvoClassInfo Class::classInfo = Class##_record
 
 /// The base object: a modified flag, a key to sort by, a stream form, a clone
 /// and class information.
