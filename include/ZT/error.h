@@ -93,8 +93,8 @@ public:
     int code;  ///< The kind.
     int level; ///< The higher, the more severe.
 
-private:
-    int system_error; // stands before the stream: making one may set errno
+protected:
+    int system_error; ///< Stands before the stream, which may set errno.
 
 public:
     char* message;             ///< The frozen text; null before `Message`.

@@ -46,10 +46,10 @@ struct ZT_API ZtTimerCallbackInfo final
 
     int kind = Trigger; ///< Of no meaning in a stop record.
     ZtTimerCallback callback = nullptr;
-    int fired = 0;        ///< Trigger: 1 once it has fired in this run.
-    long interval = 0;    ///< Repeat: milliseconds of the beat's clock.
-    long last_fired = 0;  ///< Repeat: the beat's milliseconds at its latest
-                          ///< call; -1 calls it at the next beat.
+    int fired = 0;               ///< Trigger: 1 once it has fired in this run.
+    long interval = 0;           ///< Repeat: milliseconds of the beat's clock.
+    std::int64_t last_fired = 0; ///< Repeat: the beat's milliseconds at its
+                                 ///< latest call; -1 calls it at the next beat.
     KvoTime time;         ///< Trigger: when it fires. Stop: when posted.
     void* data = nullptr; ///< The client's, handed to the callback.
     ZtTimerCallbackInfo* next = nullptr; ///< Null at the tail.
@@ -363,8 +363,8 @@ public:
     static struct timezone bstart_timezone;   ///< Not used.
     static timeval bcurrent_timeval;          ///< Not used.
     static struct timezone bcurrent_timezone; ///< Not used.
-    static KvoTime global_tm; ///< The time of day at `load`, and what has
-                              ///< passed since.
+    static KvoTime global_tm;       ///< The time of day at `load`, and what has
+                                    ///< passed since.
     static KvoTime global_start_tm; ///< The value of `global_tm` at `load`.
 };
 

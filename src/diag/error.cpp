@@ -8,6 +8,8 @@
 #include <string_view>
 
 #include "core/format_text.h"
+#include "diag/signal_report.h"
+#include "platform/signal_handler.h"
 
 // All of it is ready before any code runs: reports are made before `main` too.
 constinit int ZtErr::count = 0;
@@ -30,21 +32,41 @@ enum Kind : int {
 
 // The handler that the first report makes, or null. It has no code but the
 // base's own, so what it does with an error is known beforehand.
-ZtErrHandler* default_handler = nullptr;
+constinit ZtErrHandler* default_handler = nullptr;
+
+// Room for it, kept ready in case the first report is made in a signal.
+constinit void* default_handler_room = nullptr;
+
+// Not 0 while a queue is being changed, which a signal must leave alone then.
+constinit volatile int queues_in_change = 0;
 
 // Stands in for a text that could not be kept.
 char no_text[1] = "";
 
 void print(const char* text)
 {
+    if (zt_diag::in_signal()) {
+        zt_platform::write_standard_error(text);
+        return;
+    }
     static const std::ios_base::Init streams_are_ready;
     std::cerr << text;
+}
+
+void make_default_handler()
+{
+    const zt_platform::SignalsHeld no_report_from_a_signal;
+    zt_diag::reserve_default_handler();
+    if (ZtErrHandler::handlerStack || !default_handler_room)
+        return;
+    default_handler = new (default_handler_room) ZtErrHandler(0);
+    default_handler_room = nullptr;
 }
 
 ZtErrHandler* top_handler()
 {
     if (!ZtErrHandler::handlerStack)
-        default_handler = new (std::nothrow) ZtErrHandler(0);
+        make_default_handler();
     return ZtErrHandler::handlerStack;
 }
 
@@ -114,7 +136,7 @@ void settle(ZtErr* unclaimed)
     const int level = unclaimed->level;
     if (level >= ZtErrHandler::outputLevel)
         print(unclaimed->Message());
-    delete unclaimed;
+    zt_diag::dispose(unclaimed);
     if (level >= ZtErrHandler::abortLevel)
         ZtErrHandler::Abort();
 }
@@ -123,7 +145,59 @@ ZtErr* as_error(void* item)
 {
     return static_cast<ZtErr*>(static_cast<KvoObject*>(item));
 }
+
+/// Marks the change of a queue for a signal that interrupts it.
+class QueueChange
+{
+public:
+    QueueChange() { queues_in_change = queues_in_change + 1; }
+    ~QueueChange() { queues_in_change = queues_in_change - 1; }
+    QueueChange(const QueueChange&) = delete;
+    QueueChange& operator=(const QueueChange&) = delete;
+};
+
+// Returns: false when there was no memory for the error's place.
+bool enqueue(ZtErrHandler& handler, ZtErr* held)
+{
+    const QueueChange change;
+    const int before = handler.queue.count;
+    handler.queue.PushTail(static_cast<KvoObject*>(held));
+    return handler.queue.count != before;
+}
+
+// Moves what handlers were to hold back in a signal to their queues. It comes
+// before anything else is done to a queue, so errors stay in their order.
+void collect_from_signals()
+{
+    zt_diag::HeldInSignal held = {};
+    while (zt_diag::next_held_in_signal(held))
+        if (!enqueue(*held.handler, held.error))
+            held.handler->Handle(held.error);
+}
+
+bool may_change_queues()
+{
+    if (zt_diag::in_signal())
+        return queues_in_change == 0;
+    collect_from_signals();
+    return true;
+}
+
+bool hold_back(ZtErrHandler& handler, ZtErr* delivered)
+{
+    if (zt_diag::in_signal())
+        return zt_diag::hold_in_signal(handler, delivered);
+    collect_from_signals();
+    return enqueue(handler, delivered);
+}
 } // namespace
+
+void zt_diag::reserve_default_handler()
+{
+    if (!default_handler_room && !in_signal())
+        default_handler_room =
+            ::operator new(sizeof(ZtErrHandler), std::nothrow);
+}
 
 ZtErr::ZtErr(const char* text, int error_code, int error_level)
     : code(error_code), level(error_level), system_error(oserror()),
@@ -222,13 +296,8 @@ void ZtErrHandler::Deliver(ZtErr* delivered)
 {
     if (!delivered)
         return;
-    if (held) {
-        const int before = queue.count;
-        queue.PushTail(static_cast<KvoObject*>(delivered));
-        if (queue.count != before)
-            return;
-    }
-    Handle(delivered);
+    if (!held || !hold_back(*this, delivered))
+        Handle(delivered);
 }
 
 void ZtErrHandler::Handle(ZtErr* delivered)
@@ -251,15 +320,24 @@ void ZtErrHandler::Release()
     held = 0;
     while (ZtErr* const oldest = Pop())
         Handle(oldest);
+    // Only an abort in a signal finds any here, and it comes back no more.
+    while (ZtErr* const oldest = zt_diag::take_held_in_signal(*this))
+        Handle(oldest);
 }
 
 ZtErr* ZtErrHandler::Pop()
 {
+    if (!may_change_queues())
+        return nullptr;
+    const QueueChange change;
     return as_error(queue.Pop());
 }
 
 ZtErr* ZtErrHandler::PopTail()
 {
+    if (!may_change_queues())
+        return nullptr;
+    const QueueChange change;
     return as_error(queue.PopTail());
 }
 

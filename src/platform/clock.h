@@ -46,6 +46,21 @@ protected:
     ~Clock() = default;
 };
 
+/// A time of the day.
+struct DayTime
+{
+    int hour;
+    int minute;
+    int second;
+};
+
+/// Gives the time of the day, in this process's time zone, of a moment that
+/// `Clock::wall` told.
+///
+/// Returns: midnight for a moment that has no date.
+/// Context: must not run inside the beat.
+DayTime local_day_time(time_t moment);
+
 } // namespace zt_platform
 
 #endif

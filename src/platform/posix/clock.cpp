@@ -65,4 +65,12 @@ Clock* Clock::install(Clock* other)
     return before;
 }
 
+DayTime local_day_time(time_t moment)
+{
+    tm local = {};
+    if (!localtime_r(&moment, &local))
+        return {};
+    return {local.tm_hour, local.tm_min, local.tm_sec};
+}
+
 } // namespace zt_platform
