@@ -343,23 +343,44 @@ private:
             .tick_count;
     }
 
-    /// Splits in the width of `Count`: 32-bit divisions are several times as
-    /// fast as 64-bit ones, and any time of this class fits them.
+    /// Splits in the width of `Count`: 32-bit divisions are faster than 64-bit
+    /// ones, and any time of this class fits them.
     template <class Count>
     static constexpr long split(Count count, int* hh, int* mm, int* ss, int* ff,
                                 int fps)
     {
         const Count whole_hours = count / ticks_per_hour;
-        const auto rest =
+        const auto in_hour =
             static_cast<std::int32_t>(count - whole_hours * ticks_per_hour);
-        const std::int32_t in_minute = rest % ticks_per_minute;
-        const std::int32_t in_second = in_minute % ticks_per_second;
-        const std::int32_t frame = fps ? ticks_per_second / fps : 0;
+        const std::int32_t whole_minutes = in_hour / ticks_per_minute;
+        const std::int32_t in_minute =
+            in_hour - whole_minutes * ticks_per_minute;
+        const std::int32_t whole_seconds = in_minute / ticks_per_second;
         *hh = static_cast<int>(whole_hours);
-        *mm = rest / ticks_per_minute;
-        *ss = in_minute / ticks_per_second;
-        *ff = frame ? in_second / frame : 0;
+        *mm = whole_minutes;
+        *ss = whole_seconds;
+        *ff = whole_frames(in_minute - whole_seconds * ticks_per_second, fps);
         return whole_hours;
+    }
+
+    /// Gives the whole frames in `count` ticks, 0 where there is no such frame.
+    /// Naming the common rates turns their divisions into multiplications.
+    static constexpr int whole_frames(std::int32_t count, int fps)
+    {
+        switch (fps) {
+        case 24:
+            return count / 250;
+        case 25:
+            return count / 240;
+        case 30:
+            return count / 200;
+        case 60:
+            return count / 100;
+        default:
+            break;
+        }
+        const std::int32_t frame = fps ? ticks_per_second / fps : 0;
+        return frame ? count / frame : 0;
     }
 
     constexpr std::uint32_t bits() const
