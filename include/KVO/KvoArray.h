@@ -21,7 +21,7 @@ class ZT_API KvoArray : public KvoObject
 public:
     /// Makes an array of `initial_size` zero elements.
     ///
-    /// Requires: `element_bytes` > 0.
+    /// Units: `element_bytes` below 1 counts as 1.
     KvoArray(int element_bytes, int initial_size);
 
     /// Copies the elements into a block that fits them exactly.

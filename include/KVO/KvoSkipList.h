@@ -175,11 +175,11 @@ private:
     void reset();
     void copy_nodes(const KvoSkipList& other);
     void walk(void* key, SLNode** update) const;
-    SLNode* first_equal(void* key) const;
+    SLNode* first_equal(const void* key) const;
+    void step_over(SLNode* next, SLNode** update) const;
     int insert_after(SLNode** update, KvoObject* object);
-    void unlink(SLNode* node, SLNode** update);
+    KvoObject* take_out(SLNode* node, SLNode** update);
     void drop_empty_levels();
-    void recount();
 
     Header first;
 };
