@@ -105,7 +105,7 @@ public:
     void EatArg(int index);
 
 private:
-    void drop_comments_and_continuations();
+    int drop_comments_and_continuations();
 };
 
 /// Skips the statements of a block whose opening "begin" has been read, up to

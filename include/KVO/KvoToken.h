@@ -57,13 +57,15 @@ public:
 
     private:
         friend class KvoTokenReader;
-        static constexpr int max_vector_stops = 4;
+
+        void note_vector_stops();
 
         unsigned char actions[256];
-        /// The specials above the space that are no quotes, filled up with the
-        /// double quote; what a scan of many characters at a time looks for.
-        char vector_stops[max_vector_stops];
-        int vector_scannable; ///< 0 when there are more than fit above.
+        /// What a scan of sixteen characters at a time compares with: up to
+        /// four specials above the space that are no quotes, each filling a
+        /// row, the rows left over filled with the double quote.
+        char vector_stops[4][16];
+        bool vector_scannable; ///< Whether the specials fit above.
     };
 
     /// Makes an empty token that reads with the action table of
@@ -140,11 +142,13 @@ private:
     friend class KvoTokenReader;
     static constexpr std::size_t room_bytes = 24;
 
-    void reset_from(const KvoToken& other);
+    static KvoSkipList& action_tables();
+    static const ActionTable* action_table(const char* special_characters);
+
     void clear_text();
-    bool assign_text(const char* from, std::size_t bytes);
-    bool append_text(const char* from, std::size_t bytes);
-    bool reserve_text(std::size_t bytes);
+    void assign_text(const char* from, std::size_t bytes);
+    void append_text(const char* from, std::size_t bytes);
+    bool grow_text(std::size_t more);
     void release_text();
 
     char quote; ///< 0 when not quoted.
@@ -262,6 +266,11 @@ protected:
     /// Requires: 0 <= index, 0 <= removed, index + removed <= `Count()`.
     void remove_tokens(int index, int removed);
 
+    /// Exchanges two tokens.
+    ///
+    /// Requires: both positions are in the list.
+    void swap_tokens(int one, int other);
+
     /// Reads as `Append` does.
     ///
     /// Returns: whether every token read could be kept; false only when there
@@ -272,8 +281,9 @@ private:
     KvoToken* token_at(int index) const;
     KvoToken* spare_token();
     void copy_tokens(const KvoTokenList& other);
-    void trim_spares();
-    bool is_end_character(char character) const;
+    void trim_spares(int fresh);
+    bool ends_run(const KvoToken& token) const;
+    void drop_run(std::istream& in, KvoTokenReader& reader) const;
 
     KvoToken model; ///< What every token that is read starts as a copy of.
     /// The list's tokens, then spare ones that wait for their next use, so

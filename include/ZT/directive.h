@@ -90,6 +90,8 @@ public:
 
     /// Lets every named directive write its `Info`, in the case-blind order of
     /// the names.
+    ///
+    /// Requires: none of them adds or removes directives meanwhile.
     void Info(std::ostream& out, int number);
 
 private:

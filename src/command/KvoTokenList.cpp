@@ -1,0 +1,265 @@
+#include "KVO/KvoToken.h"
+
+#include <algorithm>
+#include <climits>
+#include <cstring>
+#include <memory>
+#include <new>
+#include <utility>
+
+#include "command/token_reader.h"
+#include "command/write_text.h"
+#include "core/number_text.h"
+
+namespace {
+// What an emptied list keeps for its next statement: this many tokens, and of
+// each no more text than this.
+constexpr int most_spare_tokens = 64;
+constexpr std::size_t most_spare_text_bytes = 256;
+
+// The two strings one behind the other; null when there is no memory.
+std::unique_ptr<char[]> joined(const char* first, const char* second)
+{
+    const std::size_t first_bytes = first ? std::strlen(first) : 0;
+    const std::size_t second_bytes = second ? std::strlen(second) : 0;
+    std::unique_ptr<char[]> text(
+        new (std::nothrow) char[first_bytes + second_bytes + 1]);
+    if (text) {
+        std::memcpy(text.get(), first ? first : "", first_bytes);
+        std::memcpy(text.get() + first_bytes, second ? second : "",
+                    second_bytes);
+        text[first_bytes + second_bytes] = '\0';
+    }
+    return text;
+}
+} // namespace
+
+KvoTokenList::KvoTokenList(const char* special_characters,
+                           const char* end_characters)
+    : model(joined(special_characters, end_characters).get()), tokens(),
+      count(0), end(KvoNewString(end_characters))
+{}
+
+KvoTokenList::KvoTokenList(const KvoTokenList& other)
+    : KvoObject(other), model(other.model), tokens(), count(0),
+      end(KvoNewString(other.end))
+{
+    copy_tokens(other);
+}
+
+KvoTokenList& KvoTokenList::operator=(const KvoTokenList& other)
+{
+    if (this == &other)
+        return *this;
+    KvoObject::operator=(other);
+    char* new_end = KvoNewString(other.end);
+    delete[] end;
+    end = new_end;
+    model = other.model;
+    Clear();
+    copy_tokens(other);
+    return *this;
+}
+
+KvoTokenList::~KvoTokenList()
+{
+    tokens.DeleteContents();
+    delete[] end;
+}
+
+void KvoTokenList::Clear()
+{
+    remove_tokens(0, count);
+}
+
+void KvoTokenList::Append(std::istream& in)
+{
+    append_run(in);
+}
+
+void KvoTokenList::Read(std::istream& in)
+{
+    Clear();
+    KvoTokenList::Append(in);
+}
+
+void KvoTokenList::Write(std::ostream& out)
+{
+    for (int i = 0; i < count; ++i) {
+        if (i > 0)
+            zt_command::write_character(out, ' ');
+        token_at(i)->Write(out);
+    }
+}
+
+void KvoTokenList::WriteQuoted(std::ostream& out)
+{
+    for (int i = 0; i < count; ++i) {
+        if (i > 0)
+            zt_command::write_character(out, ' ');
+        token_at(i)->WriteQuoted(out);
+    }
+}
+
+KvoToken* KvoTokenList::Find(const char* text) const
+{
+    return Find(FindPos(text));
+}
+
+KvoToken* KvoTokenList::Find(int index) const
+{
+    return index >= 0 && index < count ? token_at(index) : nullptr;
+}
+
+int KvoTokenList::FindPos(const char* text) const
+{
+    for (int i = 0; text && i < count; ++i)
+        if (std::strcmp(token_at(i)->text, text) == 0)
+            return i;
+    return -1;
+}
+
+int KvoTokenList::Replace(const char* old_text, const char* text)
+{
+    return Replace(FindPos(old_text), text);
+}
+
+int KvoTokenList::Replace(int index, const char* text)
+{
+    KvoToken* token = Find(index);
+    if (token)
+        token->Set(text);
+    return token != nullptr;
+}
+
+const char* KvoTokenList::ArgText(int index) const
+{
+    const KvoToken* token = Find(index);
+    return token ? token->text : nullptr;
+}
+
+int KvoTokenList::ArgInt(int index) const
+{
+    return zt_core::text_to_int(ArgText(index));
+}
+
+float KvoTokenList::ArgFloat(int index) const
+{
+    return static_cast<float>(zt_core::text_to_float(ArgText(index)));
+}
+
+KvoToken* KvoTokenList::append_token(const char* text)
+{
+    KvoToken* token = spare_token();
+    if (token) {
+        token->Set(text);
+        ++count;
+    }
+    return token;
+}
+
+// A token that is read stands behind the list's own until it proves to be more
+// than the end of the run.
+bool KvoTokenList::append_run(std::istream& in)
+{
+    if (!in.good())
+        return true;
+    KvoTokenReader reader(in);
+    do {
+        KvoToken* token = spare_token();
+        if (!token) {
+            drop_run(in, reader);
+            return false;
+        }
+        reader.read(*token);
+        if (ends_run(*token))
+            return true;
+        ++count;
+    } while (in.good());
+    return true;
+}
+
+// Reads the rest of a run into a token that needs no memory to be made.
+void KvoTokenList::drop_run(std::istream& in, KvoTokenReader& reader) const
+{
+    KvoToken dropped(model);
+    do
+        reader.read(dropped);
+    while (!ends_run(dropped) && in.good());
+}
+
+void KvoTokenList::remove_tokens(int index, int removed)
+{
+    if (removed == 0)
+        return;
+    KvoObject** all = static_cast<KvoObject**>(tokens.data);
+    std::rotate(all + index, all + index + removed, all + count);
+    count -= removed;
+    trim_spares(removed);
+}
+
+void KvoTokenList::swap_tokens(int one, int other)
+{
+    KvoObject** all = static_cast<KvoObject**>(tokens.data);
+    std::swap(all[one], all[other]);
+}
+
+KvoToken* KvoTokenList::token_at(int index) const
+{
+    return static_cast<KvoToken*>(static_cast<KvoObject**>(tokens.data)[index]);
+}
+
+// Gives the first token behind the list's own, like the model in all but its
+// text, which the caller sets; null when there is no memory for one.
+KvoToken* KvoTokenList::spare_token()
+{
+    if (count == tokens.size) {
+        if (count == INT_MAX)
+            return nullptr;
+        auto* made = new (std::nothrow) KvoToken(model);
+        if (!made)
+            return nullptr;
+        tokens.Insert(made, count);
+        if (tokens.size == count) {
+            delete made;
+            return nullptr;
+        }
+    }
+    KvoToken* token = token_at(count);
+    token->table = model.table;
+    token->modified = 0;
+    return token;
+}
+
+void KvoTokenList::copy_tokens(const KvoTokenList& other)
+{
+    for (int i = 0; i < other.count; ++i) {
+        KvoToken* token = spare_token();
+        if (!token)
+            return;
+        *token = *other.token_at(i);
+        ++count;
+    }
+}
+
+// Gives back what is too much to be kept of the spare tokens, of which the
+// first `fresh` have just become so.
+void KvoTokenList::trim_spares(int fresh)
+{
+    while (tokens.size - count > most_spare_tokens)
+        delete tokens.Pop();
+    const int last = std::min(count + fresh, tokens.size);
+    for (int i = count; i < last; ++i)
+        if (token_at(i)->capacity > most_spare_text_bytes)
+            token_at(i)->release_text();
+}
+
+bool KvoTokenList::ends_run(const KvoToken& token) const
+{
+    if (token.quote)
+        return false;
+    bool ends = token.length == 0;
+    for (const char* c = end; !ends && c && *c; ++c)
+        ends = token.text[0] == *c;
+    return ends;
+}

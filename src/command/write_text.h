@@ -1,0 +1,36 @@
+#ifndef ZT_COMMAND_WRITE_TEXT_H
+#define ZT_COMMAND_WRITE_TEXT_H
+
+/// \file
+/// Writing of text as it stands: no width, no fill, and no throwing, whatever
+/// the stream's owner has set.
+
+#include <cstring>
+#include <ostream>
+
+namespace zt_command {
+/// Writes the characters of `text` up to its NUL.
+///
+/// A stream that its owner told to throw does not throw from here; its state
+/// bits say what happened.
+inline void write_text(std::ostream& out, const char* text)
+{
+    try {
+        out.write(text, static_cast<std::streamsize>(std::strlen(text)));
+    } catch (...) {
+        // The state bits tell.
+    }
+}
+
+/// Writes one character in the same way.
+inline void write_character(std::ostream& out, char character)
+{
+    try {
+        out.put(character);
+    } catch (...) {
+        // The state bits tell.
+    }
+}
+} // namespace zt_command
+
+#endif
