@@ -1,0 +1,40 @@
+#ifndef ZT_IMAGE_PIXEL_ROWS_H
+#define ZT_IMAGE_PIXEL_ROWS_H
+
+/// \file
+/// Rows of pixels and the rows of channel values that they are made of.
+
+#include "image/picture.h"
+
+#include <cstddef>
+
+namespace zt_image {
+
+/// Four rows of channel values: red, green, blue, alpha.
+struct ChannelRows
+{
+    const unsigned char* channel[4];
+};
+
+/// Makes `count` pixels of the four rows.
+void join_channels(const ChannelRows& rows, std::size_t count,
+                   ChannelOrder order, ZtPixel* pixels);
+
+/// Takes one channel, 0 being red and 3 alpha, out of `count` pixels.
+void take_channel(const ZtPixel* pixels, std::size_t count, ChannelOrder order,
+                  int channel, unsigned char* values);
+
+/// Takes the luminance out of `count` pixels: of 256 parts 79 red, 156 green
+/// and 21 blue.
+void take_luminance(const ZtPixel* pixels, std::size_t count,
+                    ChannelOrder order, unsigned char* values);
+
+/// Makes pixels that hold a grey value in their red channel opaque grey.
+void spread_grey(ZtPixel* pixels, std::size_t count, ChannelOrder order);
+
+/// Makes pixels opaque.
+void make_opaque(ZtPixel* pixels, std::size_t count, ChannelOrder order);
+
+} // namespace zt_image
+
+#endif

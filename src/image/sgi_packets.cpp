@@ -1,0 +1,195 @@
+#include "image/sgi_packets.h"
+
+#include <algorithm>
+#include <cstring>
+
+namespace zt_image {
+
+namespace {
+
+constexpr unsigned literal_bit = 0x80;
+constexpr unsigned count_bits = 0x7F;
+constexpr std::size_t most_in_a_packet = 126;
+
+/// Copies a literal in whole blocks, past its end, which is why both sides
+/// have slack: nearly every packet is done with the first.
+void copy_values(unsigned char* to, const unsigned char* from,
+                 std::size_t count)
+{
+    std::size_t done = 0;
+    do {
+        std::memcpy(to + done, from + done, packet_slack);
+        done += packet_slack;
+    } while (done < count);
+}
+
+/// Fills with a repeated value in whole blocks, past the end.
+void fill_values(unsigned char* to, unsigned char value, std::size_t count)
+{
+    std::size_t done = 0;
+    do {
+        std::memset(to + done, value, packet_slack);
+        done += packet_slack;
+    } while (done < count);
+}
+
+/// One channel of consecutive pixels, written value by value.
+class ChannelCursor
+{
+public:
+    ChannelCursor(ZtPixel* first, const ZtPixel* last, int channel_shift)
+        : pixel(first), end(last), shift(channel_shift)
+    {}
+
+    bool at_end() const { return pixel == end; }
+
+    void put(ZtPixel value)
+    {
+        *pixel = (*pixel & ~(ZtPixel{0xFF} << shift)) | value << shift;
+        ++pixel;
+    }
+
+    std::size_t clamp(std::size_t count) const
+    {
+        return std::min(count, static_cast<std::size_t>(end - pixel));
+    }
+
+private:
+    ZtPixel* pixel;
+    const ZtPixel* end;
+    int shift;
+};
+
+const unsigned char* expand_literal(const unsigned char* packets,
+                                    const unsigned char* packets_end,
+                                    std::size_t count, ChannelCursor& channel)
+{
+    const unsigned char* next =
+        packets +
+        std::min(count, static_cast<std::size_t>(packets_end - packets));
+    const unsigned char* stop =
+        packets + channel.clamp(static_cast<std::size_t>(next - packets));
+    for (; packets != stop; ++packets)
+        channel.put(*packets);
+    return next;
+}
+
+const unsigned char* expand_repeat(const unsigned char* packets,
+                                   const unsigned char* packets_end,
+                                   std::size_t count, ChannelCursor& channel)
+{
+    if (packets == packets_end)
+        return packets;
+    for (count = channel.clamp(count); count; --count)
+        channel.put(*packets);
+    return packets + 1;
+}
+
+/// Gives the position of the first of three equal values at or after `from`;
+/// where there are none, of the last two values, or `from` if it is later.
+std::size_t find_repeat(const unsigned char* values, std::size_t from,
+                        std::size_t width)
+{
+    std::size_t at = from;
+    while (at + 2 < width &&
+           (values[at] != values[at + 1] || values[at + 1] != values[at + 2]))
+        ++at;
+    return at;
+}
+
+/// Gives the position of the first value after `from` that is another one.
+std::size_t find_other(const unsigned char* values, std::size_t from,
+                       std::size_t width)
+{
+    std::size_t at = from + 1;
+    while (at < width && values[at] == values[from])
+        ++at;
+    return at;
+}
+
+unsigned char* put_literals(const unsigned char* values, std::size_t count,
+                            unsigned char* packets)
+{
+    while (count) {
+        std::size_t todo = std::min(count, most_in_a_packet);
+        *packets++ = static_cast<unsigned char>(literal_bit | todo);
+        std::memcpy(packets, values, todo);
+        packets += todo;
+        values += todo;
+        count -= todo;
+    }
+    return packets;
+}
+
+unsigned char* put_repeats(unsigned char value, std::size_t count,
+                           unsigned char* packets)
+{
+    while (count) {
+        std::size_t todo = std::min(count, most_in_a_packet);
+        *packets++ = static_cast<unsigned char>(todo);
+        *packets++ = value;
+        count -= todo;
+    }
+    return packets;
+}
+
+} // namespace
+
+bool expand_exact_row(const unsigned char* packets,
+                      const unsigned char* packets_end, unsigned char* values,
+                      std::size_t width)
+{
+    std::size_t left = width;
+    while (packets < packets_end) {
+        unsigned packet = *packets++;
+        std::size_t count = packet & count_bits;
+        if (count == 0)
+            break;
+        std::size_t needed = packet & literal_bit ? count : 1;
+        if (count > left ||
+            needed > static_cast<std::size_t>(packets_end - packets))
+            return false;
+        if (packet & literal_bit)
+            copy_values(values, packets, count);
+        else
+            fill_values(values, *packets, count);
+        packets += needed;
+        values += count;
+        left -= count;
+    }
+    return left == 0;
+}
+
+void expand_row(const unsigned char* packets, const unsigned char* packets_end,
+                ZtPixel* pixels, const ZtPixel* pixels_end, int shift)
+{
+    ChannelCursor channel(pixels, pixels_end, shift);
+    while (packets < packets_end && !channel.at_end()) {
+        unsigned packet = *packets++;
+        std::size_t count = packet & count_bits;
+        if (count == 0)
+            return;
+        if (packet & literal_bit)
+            packets = expand_literal(packets, packets_end, count, channel);
+        else
+            packets = expand_repeat(packets, packets_end, count, channel);
+    }
+}
+
+// A literal ends just before the first three equal values, or two values short
+// of the row's end; what follows it goes out as repeats, also of one or two.
+unsigned char* compress_row(const unsigned char* values, std::size_t width,
+                            unsigned char* packets)
+{
+    std::size_t at = 0;
+    while (at < width) {
+        std::size_t repeat = find_repeat(values, at, width);
+        packets = put_literals(values + at, repeat - at, packets);
+        at = find_other(values, repeat, width);
+        packets = put_repeats(values[repeat], at - repeat, packets);
+    }
+    *packets++ = 0;
+    return packets;
+}
+
+} // namespace zt_image

@@ -1,0 +1,249 @@
+#include "image/picture.h"
+
+#include "image/file_window.h"
+#include "image/pixel_rows.h"
+#include "image/sgi_header.h"
+#include "image/sgi_packets.h"
+#include "image/sgi_rows.h"
+#include "platform/files.h"
+
+#include <algorithm>
+#include <cstdlib>
+#include <cstring>
+
+// Most files hold rows that fill their width exactly, in whatever order they
+// lie: such a row is expanded channel by channel into bytes, and its channels
+// are joined into pixels while they are at hand. As soon as one row is longer
+// or shorter, the file is read anew, row after row into the cleared picture,
+// which decides what overlapping rows mean.
+
+namespace zt_image {
+
+namespace {
+
+using zt_platform::InputFile;
+
+constexpr std::size_t most_channels = 4;
+
+/// What the reading of one file works on.
+struct Reading
+{
+    const InputFile& file;
+    const SgiHeader& header;
+    ZtPixel* pixels;
+    ChannelOrder order;
+
+    std::size_t width() const { return header.xsize; }
+    std::size_t height() const { return header.ysize; }
+
+    /// Channels that end up in the picture; a second one is dropped.
+    std::size_t shown_channels() const
+    {
+        return header.zsize == 2 ? 1 : header.zsize;
+    }
+};
+
+/// Rows of channel values, one for each channel, and a row of opaque alpha.
+class PlaneRows
+{
+public:
+    explicit PlaneRows(std::size_t width)
+        : stride(width + packet_slack),
+          bytes(static_cast<unsigned char*>(
+              std::calloc(most_channels + 1, stride)))
+    {
+        if (bytes)
+            std::memset(plane(most_channels), 0xFF, stride);
+    }
+
+    ~PlaneRows() { std::free(bytes); }
+    PlaneRows(const PlaneRows&) = delete;
+    PlaneRows& operator=(const PlaneRows&) = delete;
+
+    bool made() const { return bytes != nullptr; }
+    unsigned char* plane(std::size_t channel)
+    {
+        return bytes + channel * stride;
+    }
+    const unsigned char* opaque() { return plane(most_channels); }
+
+private:
+    std::size_t stride;
+    unsigned char* bytes;
+};
+
+/// Completes what a file's channels are in a picture: fewer than three are
+/// grey, fewer than four opaque.
+ChannelRows complete(const unsigned char* const (&planes)[most_channels],
+                     const unsigned char* opaque, std::size_t zsize)
+{
+    if (zsize < 3)
+        return {{planes[0], planes[0], planes[0], opaque}};
+    return {{planes[0], planes[1], planes[2], zsize == 3 ? opaque : planes[3]}};
+}
+
+/// Reads rows that all fill their width exactly.
+///
+/// Returns: false when one does not, and for lack of memory.
+bool read_exact_rows(const Reading& reading, const SgiRowTable& table,
+                     bool in_order)
+{
+    PlaneRows rows(reading.width());
+    if (!rows.made())
+        return false;
+    // Rows that do not follow one another lie channel by channel, most likely.
+    FileWindow windows[most_channels] = {
+        FileWindow(reading.file), FileWindow(reading.file),
+        FileWindow(reading.file), FileWindow(reading.file)};
+    const unsigned char* const planes[most_channels] = {
+        rows.plane(0), rows.plane(1), rows.plane(2), rows.plane(3)};
+    ChannelRows row = complete(planes, rows.opaque(), reading.header.zsize);
+    for (std::size_t y = 0; y < reading.height(); ++y) {
+        for (std::size_t z = 0; z < reading.shown_channels(); ++z) {
+            std::size_t bytes = std::min<std::size_t>(
+                table.length(y, z), most_packet_bytes(reading.width()));
+            const unsigned char* packets =
+                windows[in_order ? 0 : z].at(table.start(y, z), bytes);
+            if (!packets || !expand_exact_row(packets, packets + bytes,
+                                              rows.plane(z), reading.width()))
+                return false;
+        }
+        join_channels(row, reading.width(), reading.order,
+                      reading.pixels + y * reading.width());
+    }
+    return true;
+}
+
+/// Gives the most bytes that can matter of a row that starts at pixel `first`:
+/// it may run on to the picture's end, and no further than the file reaches
+/// but for one packet of zeros.
+std::size_t useful_bytes(const Reading& reading, const SgiRowTable& table,
+                         std::size_t y, std::size_t z)
+{
+    std::size_t pixels = (reading.height() - y) * reading.width();
+    std::uint64_t start = table.start(y, z);
+    std::uint64_t held =
+        reading.file.size() > start ? reading.file.size() - start : 0;
+    return std::min({static_cast<std::uint64_t>(table.length(y, z)),
+                     static_cast<std::uint64_t>(most_packet_bytes(pixels)),
+                     held + 128});
+}
+
+/// Reads rows of any kind.
+///
+/// Returns: false for lack of memory.
+bool read_any_rows(const Reading& reading, const SgiRowTable& table)
+{
+    std::size_t count = reading.width() * reading.height();
+    std::memset(reading.pixels, 0, count * sizeof(ZtPixel));
+    FileWindow window(reading.file);
+    for (std::size_t z = 0; z < reading.shown_channels(); ++z)
+        for (std::size_t y = 0; y < reading.height(); ++y) {
+            std::size_t bytes = useful_bytes(reading, table, y, z);
+            const unsigned char* packets = window.at(table.start(y, z), bytes);
+            if (!packets)
+                return false;
+            expand_row(packets, packets + bytes,
+                       reading.pixels + y * reading.width(),
+                       reading.pixels + count,
+                       channel_shift(reading.order, static_cast<int>(z)));
+        }
+    if (reading.header.zsize < 3)
+        spread_grey(reading.pixels, count, reading.order);
+    else if (reading.header.zsize == 3)
+        make_opaque(reading.pixels, count, reading.order);
+    return true;
+}
+
+/// Reads the rows of a run-length file.
+///
+/// Returns: false for lack of memory, and when rows out of order are too long
+///          and the handler for that has returned.
+bool read_run_length(const Reading& reading)
+{
+    SgiRowTable table;
+    if (!table.read(reading.file, reading.header))
+        return false;
+    bool in_order = table.in_order();
+    if (!in_order && table.any_longer_than(row_bound(reading.width()))) {
+        overlong_row();
+        return false;
+    }
+    return read_exact_rows(reading, table, in_order) ||
+           read_any_rows(reading, table);
+}
+
+/// Reads the planes of a verbatim file, a row of each at a time.
+///
+/// Returns: false for lack of memory.
+bool read_verbatim(const Reading& reading)
+{
+    PlaneRows rows(reading.width());
+    if (!rows.made())
+        return false;
+    FileWindow windows[most_channels] = {
+        FileWindow(reading.file), FileWindow(reading.file),
+        FileWindow(reading.file), FileWindow(reading.file)};
+    const unsigned char* planes[most_channels] = {rows.plane(0), rows.plane(1),
+                                                  rows.plane(2), rows.plane(3)};
+    for (std::size_t y = 0; y < reading.height(); ++y) {
+        for (std::size_t z = 0; z < reading.shown_channels(); ++z) {
+            std::uint64_t row = z * reading.height() + y;
+            planes[z] = windows[z].at(sgi_header_bytes + row * reading.width(),
+                                      reading.width());
+            if (!planes[z])
+                return false;
+        }
+        join_channels(complete(planes, rows.opaque(), reading.header.zsize),
+                      reading.width(), reading.order,
+                      reading.pixels + y * reading.width());
+    }
+    return true;
+}
+
+/// Writes the five words that follow the pixels of a picture that was read.
+void add_tag(ZtPixel* behind_pixels, const SgiHeader& header)
+{
+    const ZtPixel tag[] = {0x12345678, 0x59493333, 0x69434222, header.xsize,
+                           header.ysize};
+    std::memcpy(behind_pixels, tag, sizeof tag);
+}
+
+constexpr std::size_t tag_bytes = 5 * sizeof(ZtPixel);
+
+} // namespace
+
+Picture read_sgi(const char* name, ChannelOrder order)
+{
+    InputFile file(name);
+    if (!file.is_open())
+        return {};
+    SgiHeader header = read_sgi_header(file);
+    if (header.imagic != sgi_magic || header.bytes_a_channel() != 1) {
+        hold_refused(file);
+        return {};
+    }
+    std::size_t width = header.xsize;
+    std::size_t height = header.ysize;
+    if (header.zsize > most_channels || !within_pixel_limit(width, height))
+        return {};
+    ZtPixel* pixels = new_pixels(width, height, tag_bytes);
+    if (!pixels)
+        return {};
+    Reading reading = {file, header, pixels, order};
+    bool read = header.is_run_length() ? read_run_length(reading)
+                                       : read_verbatim(reading);
+    if (!read) {
+        std::free(pixels);
+        return {};
+    }
+    add_tag(pixels + width * height, header);
+    return {pixels, header.xsize, header.ysize};
+}
+
+} // namespace zt_image
+
+ZtPixel* longimagedata(const char* name)
+{
+    return zt_image::read_sgi(name, zt_image::ChannelOrder::Codec).pixels;
+}
