@@ -1,0 +1,62 @@
+#include "support/FailingMalloc.h"
+
+#include <cstddef>
+
+namespace {
+
+bool counting;
+int first_to_fail;
+int requests;
+
+/// Counts a request and tells whether it is to fail.
+bool fails()
+{
+    return counting && requests++ >= first_to_fail;
+}
+
+} // namespace
+
+extern "C" {
+
+void* __real_malloc(std::size_t bytes);
+void* __real_calloc(std::size_t count, std::size_t bytes);
+void* __real_realloc(void* block, std::size_t bytes);
+void* __real_aligned_alloc(std::size_t alignment, std::size_t bytes);
+
+void* __wrap_malloc(std::size_t bytes)
+{
+    return fails() ? nullptr : __real_malloc(bytes);
+}
+
+void* __wrap_calloc(std::size_t count, std::size_t bytes)
+{
+    return fails() ? nullptr : __real_calloc(count, bytes);
+}
+
+void* __wrap_realloc(void* block, std::size_t bytes)
+{
+    return fails() ? nullptr : __real_realloc(block, bytes);
+}
+
+void* __wrap_aligned_alloc(std::size_t alignment, std::size_t bytes)
+{
+    return fails() ? nullptr : __real_aligned_alloc(alignment, bytes);
+}
+}
+
+FailingMalloc::FailingMalloc(int first)
+{
+    requests = 0;
+    first_to_fail = first;
+    counting = true;
+}
+
+FailingMalloc::~FailingMalloc()
+{
+    counting = false;
+}
+
+int FailingMalloc::Requests() const
+{
+    return requests;
+}
