@@ -38,13 +38,6 @@ constexpr void store_big_32(unsigned char* bytes, std::uint32_t value)
     store_big_16(bytes + 2, static_cast<std::uint16_t>(value));
 }
 
-/// Reverses the four bytes of a word.
-constexpr std::uint32_t reverse_bytes(std::uint32_t word)
-{
-    return word >> 24 | (word >> 8 & 0xFF00) | (word << 8 & 0xFF0000) |
-           word << 24;
-}
-
 } // namespace zt_platform
 
 #endif

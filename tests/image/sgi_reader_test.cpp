@@ -14,14 +14,20 @@ namespace {
 
 using zt_image::ChannelOrder;
 
-/// Reads a file of these bytes in codec order; nothing when it is refused.
+/// Reads the file at `path` in codec order; nothing when it is refused.
+std::optional<PixelList> ReadFile(const std::string& path)
+{
+    zt_image::Picture picture =
+        zt_image::read_sgi(path.c_str(), ChannelOrder::Codec);
+    return Taken(picture.pixels, static_cast<std::size_t>(picture.width) *
+                                     static_cast<std::size_t>(picture.height));
+}
+
+/// Reads a file of these bytes.
 std::optional<PixelList> Read(const std::string& bytes)
 {
     TempDir directory;
-    zt_image::Picture picture = zt_image::read_sgi(
-        directory.Write("a", bytes).c_str(), ChannelOrder::Codec);
-    return Taken(picture.pixels, static_cast<std::size_t>(picture.width) *
-                                     static_cast<std::size_t>(picture.height));
+    return ReadFile(directory.Write("a", bytes));
 }
 
 TEST(sgi_reader, ThreeChannelsGetAlpha255)
@@ -244,6 +250,7 @@ TEST(sgi_reader, RandomPacketsAgreeWithAPlainReader)
 {
     ZtSetOverlongRowHandler([] {});
     std::mt19937 random(3);
+    TempDir directory;
     auto number = [&random](unsigned below) {
         return static_cast<unsigned>(random() % below);
     };
@@ -263,7 +270,8 @@ TEST(sgi_reader, RandomPacketsAgreeWithAPlainReader)
         file.resize(file.size() - std::min<std::size_t>(number(30), 20));
         literal::Picture expected = literal::ReadSgi(file);
 
-        std::optional<PixelList> pixels = Read(file);
+        std::optional<PixelList> pixels =
+            ReadFile(directory.Write(std::to_string(i), file));
 
         ASSERT_EQ(pixels.has_value(), expected.read) << i;
         ASSERT_TRUE(!pixels || *pixels == expected.pixels) << i;
@@ -313,15 +321,18 @@ TEST(sgi_reader, AReadFaultIsAFileThatEndsThere)
     std::string run_length = SgiFile({}, {.rows = PlainRows({})});
     std::string verbatim =
         SgiHeaderBytes({.storage = 0}) + "0123456789ABCDEF0123456789ABCDEF";
-    for (const std::string& file : {run_length, verbatim})
+    TempDir directory;
+    for (const std::string& file : {run_length, verbatim}) {
+        std::string path = directory.Write("a", file);
         for (std::size_t end = 0; end <= file.size(); ++end) {
             FaultyFiles files;
             files.read_ends = end;
 
-            ASSERT_EQ(Read(file).value_or(PixelList()),
+            ASSERT_EQ(ReadFile(path).value_or(PixelList()),
                       literal::ReadSgi(file.substr(0, end)).pixels)
                 << end;
         }
+    }
 }
 
 TEST(sgi_reader, AFileThatIsNotOpenedForLackOfHandlesIsNull)

@@ -5,13 +5,17 @@
 namespace {
 
 bool counting;
+bool only_first;
 int first_to_fail;
 int requests;
 
 /// Counts a request and tells whether it is to fail.
 bool fails()
 {
-    return counting && requests++ >= first_to_fail;
+    if (!counting)
+        return false;
+    int request = requests++;
+    return only_first ? request == first_to_fail : request >= first_to_fail;
 }
 
 } // namespace
@@ -44,8 +48,9 @@ void* __wrap_aligned_alloc(std::size_t alignment, std::size_t bytes)
 }
 }
 
-FailingMalloc::FailingMalloc(int first)
+FailingMalloc::FailingMalloc(int first, bool only_one)
 {
+    only_first = only_one;
     requests = 0;
     first_to_fail = first;
     counting = true;

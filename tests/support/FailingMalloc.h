@@ -1,8 +1,8 @@
 #ifndef ZT_TESTS_FAILINGMALLOC_H
 #define ZT_TESTS_FAILINGMALLOC_H
 
-/// Makes requests for memory fail while it lives: all from the one with number
-/// `first` on, counted from 0 at its making.
+/// Makes requests for memory fail while it lives: the one with number `first`,
+/// counted from 0 at its making, and all after it unless it is `only_one`.
 ///
 /// Works in tests that are linked with `zt_failing_malloc`: there `malloc`,
 /// `calloc`, `realloc` and `aligned_alloc` of the test and of the library come
@@ -10,7 +10,7 @@
 class FailingMalloc
 {
 public:
-    explicit FailingMalloc(int first);
+    explicit FailingMalloc(int first, bool only_one = false);
     ~FailingMalloc();
     FailingMalloc(const FailingMalloc&) = delete;
     FailingMalloc& operator=(const FailingMalloc&) = delete;
@@ -20,25 +20,25 @@ public:
 };
 
 /// Runs `operation` again and again, each time with a later request for memory
-/// failing and all after it, until it makes none that fails; `check` looks at
-/// the outcome each time, with memory again.
+/// failing, alone and with all after it, until it makes none that fails;
+/// `check` looks at the outcome each time, with memory again.
 ///
-/// Returns: how often it was run with a failure, so that a test can insist on
-///          at least one.
+/// Returns: how many requests failed, so that a test can insist on one.
 template <class Operation, class Check>
 int WithEveryRequestFailing(const Operation& operation, const Check& check)
 {
-    for (int first = 0;; ++first) {
-        int requests = 0;
-        {
-            FailingMalloc memory(first);
-            operation();
-            requests = memory.Requests();
+    for (int first = 0;; ++first)
+        for (bool only_one : {false, true}) {
+            int requests = 0;
+            {
+                FailingMalloc memory(first, only_one);
+                operation();
+                requests = memory.Requests();
+            }
+            if (requests <= first)
+                return first;
+            check();
         }
-        if (requests <= first)
-            return first;
-        check();
-    }
 }
 
 #endif

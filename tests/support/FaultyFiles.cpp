@@ -39,9 +39,12 @@ std::ptrdiff_t FaultyFiles::read_at(int handle, void* to, std::size_t bytes,
     ++reads;
     std::uint64_t most =
         std::min<std::uint64_t>(most_at_once, read_ends - offset);
-    return system.read_at(
+    std::ptrdiff_t got = system.read_at(
         handle, to,
         static_cast<std::size_t>(std::min<std::uint64_t>(bytes, most)), offset);
+    if (got > 0)
+        bytes_read += static_cast<std::uint64_t>(got);
+    return got;
 }
 
 int FaultyFiles::open_output(const char* path)

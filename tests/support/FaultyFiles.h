@@ -37,6 +37,7 @@ public:
 
     int open_count = 0; ///< Files that are open now.
     int reads = 0;      ///< Calls that reached the system.
+    std::uint64_t bytes_read = 0;
     int writes = 0;
 
 private:

@@ -1,0 +1,131 @@
+// What happens when memory runs out, at each request in turn.
+
+#include <ZT/image_sgi.h>
+
+#include <cstdlib>
+#include <filesystem>
+
+#include <gtest/gtest.h>
+
+#include "image/fant.h"
+#include "image/literal_codec.h"
+#include "image/pictures.h"
+#include "image/sgi_bytes.h"
+#include "image/zoom.h"
+#include "support/FailingMalloc.h"
+#include "support/TempDir.h"
+
+namespace {
+
+TEST(image_memory, ASgiImageIsNullOrWhole)
+{
+    TempDir directory;
+    std::string irregular =
+        SgiFile({}, {.rows = EqualRows({}, Bytes({0x02, 0x07, 0x00}))});
+    for (const std::string& file :
+         {SgiFile({}, {.rows = PlainRows({})}), irregular,
+          SgiHeaderBytes({.storage = 0}) + Fill(48, 0x22)}) {
+        std::string path = directory.Write("a", file);
+        PixelList expected = literal::ReadSgi(file).pixels;
+        ZtPixel* pixels = nullptr;
+        int nulls = 0;
+
+        int failed = WithEveryRequestFailing(
+            [&] { pixels = longimagedata(path.c_str()); },
+            [&] {
+                nulls += !pixels;
+                EXPECT_TRUE(!pixels || Taken(pixels, 16) == expected);
+            });
+
+        EXPECT_GE(failed, 3);
+        EXPECT_GE(nulls, failed);
+        EXPECT_EQ(Taken(pixels, 16), expected);
+    }
+}
+
+TEST(image_memory, AFileThatCannotBeMadeIsNotTouched)
+{
+    TempDir directory;
+    std::string path = directory.Path("a");
+    PixelList picture(16, 0x12345678);
+    int result = 0;
+
+    int failed = WithEveryRequestFailing(
+        [&] { result = longstoimage(picture.data(), 4, 4, 3, path.c_str()); },
+        [&] {
+            EXPECT_EQ(result, 0);
+            EXPECT_FALSE(std::filesystem::exists(path));
+        });
+
+    EXPECT_EQ(failed, 3);
+    EXPECT_EQ(result, 1);
+}
+
+TEST(image_memory, AVideoFrameIsNull)
+{
+    TempDir directory;
+    std::string path = directory.Write("a", "");
+    ZtPixel* pixels = nullptr;
+
+    int failed = WithEveryRequestFailing(
+        [&] { pixels = longimageyuvdata(path.c_str()); },
+        [&] { EXPECT_EQ(pixels, nullptr); });
+
+    EXPECT_EQ(failed, 2);
+    EXPECT_TRUE(Taken(pixels, 720 * 486));
+}
+
+TEST(image_memory, APixFileIsNull)
+{
+    TempDir directory;
+    std::string path = directory.Write("a", Big16(1) + Big16(1) + Big16(0) +
+                                                Big16(0) + Big16(24));
+    QuarnHeader header;
+    ZtPixel* pixels = nullptr;
+
+    int failed = WithEveryRequestFailing(
+        [&] { pixels = ReadQuarnPix(path.c_str(), header); },
+        [&] { EXPECT_EQ(pixels, nullptr); });
+
+    EXPECT_EQ(failed, 2);
+    EXPECT_EQ(Taken(pixels, 1), PixelList(1, 0));
+}
+
+TEST(image_memory, TheNearestPixelsAreNotTaken)
+{
+    PixelList picture = {1, 2, 3, 4};
+    PixelList out(9, 7);
+    bool done = false;
+
+    int failed = WithEveryRequestFailing(
+        [&] {
+            done =
+                zt_image::zoom_nearest(picture.data(), out.data(), 2, 2, 3, 3);
+        },
+        [&] {
+            EXPECT_FALSE(done);
+            EXPECT_EQ(out, PixelList(9, 7));
+        });
+
+    EXPECT_EQ(failed, 1);
+    EXPECT_EQ(out, literal::Zoom(picture, 2, 2, 3, 3));
+}
+
+TEST(image_memory, AreasAreNotAveraged)
+{
+    PixelList picture = {1, 2, 3, 4};
+    PixelList out(9, 7);
+    bool done = false;
+
+    int failed = WithEveryRequestFailing(
+        [&] {
+            done = zt_image::zoom_fant(picture.data(), 2, 2, out.data(), 3, 3);
+        },
+        [&] { EXPECT_FALSE(done); });
+
+    EXPECT_GE(failed, 4);
+    EXPECT_TRUE(done);
+    EXPECT_EQ(out, literal::Fant(picture, 2, 2, 3, 3));
+}
+
+} // namespace
