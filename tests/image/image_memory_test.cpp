@@ -128,4 +128,81 @@ TEST(image_memory, AreasAreNotAveraged)
     EXPECT_EQ(out, literal::Fant(picture, 2, 2, 3, 3));
 }
 
+TEST(image_memory, ScalingLeavesThePictureAsItIs)
+{
+    PixelList pixels = {1, 2, 3, 4};
+    for (auto scale : {&ZtImageSGI::Resize, &ZtImageSGI::ResizeBest}) {
+        ZtImageSGI image(2, 2, NewPixels(pixels));
+
+        // A width of its own, since the map of columns is kept.
+        int failed =
+            WithEveryRequestFailing([&] { (image.*scale)(5, 3); },
+                                    [&] {
+                                        EXPECT_EQ(image.width, 2);
+                                        EXPECT_EQ(PixelsOf(image), pixels);
+                                    });
+
+        EXPECT_GE(failed, 2);
+        EXPECT_EQ(image.width, 5);
+        EXPECT_EQ(image.height, 3);
+    }
+}
+
+TEST(image_memory, APictureThatCannotBeMadeIsEmpty)
+{
+    for (int width : {0, 3}) {
+        bool empty = false;
+
+        int failed = WithEveryRequestFailing(
+            [&] {
+                ZtImageSGI image(width, 2, nullptr);
+                empty = !image.pixels && !image.width && !image.height;
+            },
+            [&] { EXPECT_TRUE(empty); });
+
+        EXPECT_EQ(failed, 1);
+        EXPECT_FALSE(empty);
+    }
+}
+
+TEST(image_memory, ACopyIsEmptyAndAnAssignmentDoesNothing)
+{
+    ZtImageSGI image(2, 1, NewPixels({1, 2}));
+    ZtImageSGI other(1, 1, NewPixels({7}));
+    bool empty = false;
+
+    WithEveryRequestFailing(
+        [&] {
+            ZtImageSGI copy(image);
+            empty = !copy.pixels && !copy.width && !copy.height;
+        },
+        [&] { EXPECT_TRUE(empty); });
+    WithEveryRequestFailing(
+        [&] { other = image; },
+        [&] { EXPECT_EQ(PixelsOf(other), PixelList(1, 7)); });
+
+    EXPECT_FALSE(empty);
+    EXPECT_EQ(PixelsOf(other), (PixelList{1, 2}));
+}
+
+TEST(image_memory, ALoadByNameIsEmptyAndThrowsNothing)
+{
+    TempDir directory;
+    std::string path =
+        directory.Write("a.rgb", SgiFile({}, {.rows = PlainRows({})}));
+    std::size_t empty = 0;
+    PixelList expected(16, 0x404142FF);
+
+    int failed = WithEveryRequestFailing(
+        [&] {
+            ZtImageSGI image(path.c_str(), 3);
+            empty += !image.pixels && !image.width && !image.height;
+        },
+        [] {});
+
+    EXPECT_GE(failed, 4);
+    EXPECT_GE(empty, static_cast<std::size_t>(failed));
+    EXPECT_EQ(PixelsOf(ZtImageSGI(path.c_str(), 3)), expected);
+}
+
 } // namespace

@@ -20,8 +20,12 @@ TEST(InAChild, ABodyThatDoesWellIsNoFailure)
 
 TEST(InAChild, ACheckThatFailsIsAFailure)
 {
-    EXPECT_NONFATAL_FAILURE(RunInAChild([] { EXPECT_EQ(1, 2); }),
-                            "the child failed");
+    auto run_and_tell = [] {
+        RunInAChild([] { EXPECT_EQ(1, 2); });
+        std::_Exit(testing::Test::HasFailure() ? 7 : 0);
+    };
+
+    EXPECT_EXIT(run_and_tell(), testing::ExitedWithCode(7), "");
 }
 
 TEST(InAChild, AnEndOfTheProcessIsAFailure)
