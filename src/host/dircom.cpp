@@ -64,8 +64,8 @@ void ZtCommonDirectives::Act(KvoStatement* statement, int selector)
         Include(statement->ArgText(1));
         break;
     case ChangeDirectory:
-        zt_platform::Processes::current().change_directory(
-            statement->ArgText(1));
+        if (const char* const directory = statement->ArgText(1))
+            zt_platform::Processes::current().change_directory(directory);
         break;
     case Shell:
         System(statement);
