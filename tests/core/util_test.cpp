@@ -3,6 +3,7 @@
 #include <climits>
 #include <cstring>
 #include <functional>
+#include <initializer_list>
 #include <numeric>
 #include <random>
 #include <string>
@@ -187,8 +188,8 @@ TEST(ZtFmt, FormatsLikePrintf)
 
 TEST(ZtFmt, FormatsTextOfAnyLength)
 {
-    for (std::size_t length :
-         {0, 1, 1022, 1023, 1024, 1025, 2047, 2048, 70000}) {
+    for (const std::size_t length : std::initializer_list<std::size_t>{
+             0, 1, 1022, 1023, 1024, 1025, 2047, 2048, 70000}) {
         const std::string text(length, 'x');
         EXPECT_EQ(ZtFmt("%s", text.c_str()), text) << length;
     }
@@ -285,7 +286,8 @@ TEST(ZtQuote, TakesNullAsTheEmptyText)
 
 TEST(ZtQuote, WrapsTextOfAnyLength)
 {
-    for (std::size_t length : {1020, 1021, 1022, 1023, 1024, 70000}) {
+    for (const std::size_t length : std::initializer_list<std::size_t>{
+             1020, 1021, 1022, 1023, 1024, 70000}) {
         const std::string text(length, 'x');
         EXPECT_EQ(ZtQuote(text.c_str(), '<', '>', nullptr), "<" + text + ">");
     }

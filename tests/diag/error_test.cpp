@@ -4,6 +4,7 @@
 #include <csignal>
 #include <cstring>
 #include <functional>
+#include <initializer_list>
 #include <iostream>
 #include <memory>
 #include <sstream>
@@ -746,7 +747,8 @@ TEST_F(Messages, AddNoNewline)
 
 TEST_F(Messages, TakeTextOfAnyLength)
 {
-    for (std::size_t length : {1023, 1024, 2047, 2048, 70000}) {
+    for (const std::size_t length :
+         std::initializer_list<std::size_t>{1023, 1024, 2047, 2048, 70000}) {
         const std::string text(length, 'x');
         ErrorTrap trap;
 
