@@ -143,10 +143,12 @@ public:
     Element& operator[](int index)
     {
         if (!holds(index)) {
-            if (index == size && takes_one_more())
-                elements()[size++] = Element();
-            else if (!bring_into_use(index))
+            if (index == size && takes_one_more()) {
+                elements()[index] = Element();
+                size = index + 1;
+            } else if (!bring_into_use(index)) {
                 return scratch();
+            }
         }
         return elements()[index];
     }

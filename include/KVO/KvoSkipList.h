@@ -174,14 +174,25 @@ private:
 
     void reset();
     void copy_nodes(const KvoSkipList& other);
-    void walk(void* key, SLNode** update) const;
-    SLNode* first_equal(const void* key) const;
-    void step_over(SLNode* next, SLNode** update) const;
+    SLNode* walk(const void* key, SLNode** update) const;
+    SLNode* step_over(SLNode* node, void* key, SLNode** update) const;
     int insert_after(SLNode** update, KvoObject* object);
     KvoObject* take_out(SLNode* node, SLNode** update);
     void drop_empty_levels();
 
     Header first;
 };
+
+inline KvoObject* KvoSkipList::Next() const
+{
+    if (current)
+        current = current->forward[0];
+    if (!current)
+        return nullptr;
+    // The next node of this height stands some nodes ahead: it is on its way
+    // while the walk waits for those in between.
+    __builtin_prefetch(current->forward[current->level]);
+    return current->object;
+}
 
 #endif

@@ -22,7 +22,8 @@ std::size_t bytes_of(int count, int element_bytes)
 } // namespace
 
 KvoArray::KvoArray(int element_bytes, int initial_size)
-    : data(nullptr), capacity(0), size(0), elementSize(std::max(element_bytes, 1))
+    : data(nullptr), capacity(0), size(0),
+      elementSize(std::max(element_bytes, 1))
 {
     SetSize(initial_size);
 }
@@ -135,8 +136,8 @@ void KvoArray::resize_with_slack(long long new_size)
     if (3LL * capacity >= 4 * new_size)
         Allocate(static_cast<int>(new_size));
     else if (capacity < new_size)
-        Allocate(static_cast<int>(
-            std::min<long long>(new_size * 5 / 4, INT_MAX)));
+        Allocate(
+            static_cast<int>(std::min<long long>(new_size * 5 / 4, INT_MAX)));
     if (new_size > capacity)
         return;
     const int old_size = size;

@@ -12,10 +12,10 @@ int KvoObjArray::Find(KvoObject* object) const
 void KvoObjArray::Insert(KvoObject* object, int index)
 {
     const int old_size = size;
-    index = std::clamp(index, 0, old_size);
-    BumpSize(1);
-    if (size == old_size)
+    (*this)[old_size] = object;
+    if (size == old_size || index >= old_size)
         return;
+    index = std::max(index, 0);
     CopyElements(data, data, index + 1, index, old_size - index);
     elements()[index] = object;
 }

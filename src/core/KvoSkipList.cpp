@@ -25,8 +25,8 @@ constexpr int max_levels = KvoSkipList::max_levels;
 
 constinit bool random_seeded = false;
 
-// Nodes that wait to be used again, by level, chained by `forward`; those of
-// all lists.
+// Nodes that wait to be used again, by level, chained by `forward[0]`; those
+// of all lists.
 constinit SLNode* spare_nodes[max_levels] = {};
 
 SLNode** forwards_behind(SLNode* node)
@@ -42,20 +42,18 @@ std::size_t node_bytes(int level)
 
 SLNode* take_node(int level, KvoObject* object)
 {
-    SLNode*& spare = spare_nodes[level];
-    void* piece = spare;
-    if (zt_core::pieces_are_separate)
-        piece = ::operator new(node_bytes(level), std::nothrow);
-    else if (piece)
-        spare = reinterpret_cast<SLNode*>(spare->forward);
-    else
-        piece = zt_core::Slab::carve(node_bytes(level));
+    if (SLNode* node = spare_nodes[level]) {
+        spare_nodes[level] = node->forward[0];
+        node->object = object;
+        return node;
+    }
+    void* piece = zt_core::pieces_are_separate
+                      ? ::operator new(node_bytes(level), std::nothrow)
+                      : zt_core::Slab::carve(node_bytes(level));
     if (!piece)
         return nullptr;
     auto* node = static_cast<SLNode*>(piece);
-    node->object = object;
-    node->forward = forwards_behind(node);
-    node->level = level;
+    *node = {object, forwards_behind(node), level};
     return node;
 }
 
@@ -65,9 +63,8 @@ void free_node(SLNode* node)
         ::operator delete(node);
         return;
     }
-    SLNode*& spare = spare_nodes[node->level];
-    node->forward = reinterpret_cast<SLNode**>(spare);
-    spare = node;
+    node->forward[0] = spare_nodes[node->level];
+    spare_nodes[node->level] = node;
 }
 
 int random_level()
@@ -75,6 +72,25 @@ int random_level()
     const auto bits =
         static_cast<unsigned long>(zt_platform::Random::current().draw());
     return std::max(std::countr_one(bits) - 1, 0);
+}
+
+/// Fetches what can be asked after `next`, which follows `node` on `level`: what
+/// lies below `node`, and the one behind `next`.
+///
+/// Always inlined, for g++ takes a function that only fetches for one without
+/// any effect and drops its calls.
+[[gnu::always_inline]] inline void fetch_ahead(SLNode* node, SLNode* next,
+                                               int level)
+{
+    if (level > 0) {
+        SLNode* below = forwards_behind(node)[level - 1];
+        __builtin_prefetch(below->object);
+        __builtin_prefetch(forwards_behind(below)[level - 1]);
+    }
+    if (const SLNode* behind = forwards_behind(next)[level])
+        __builtin_prefetch(behind->object);
+    if (level > 1)
+        __builtin_prefetch(forwards_behind(node)[level - 2]);
 }
 
 /// Compares the object of `node` with `key`; an empty slot is after every key.
@@ -171,37 +187,41 @@ void KvoSkipList::CloneContents()
             node->object = node->object->Clone();
 }
 
-void KvoSkipList::walk(void* key, SLNode** update) const
+// Gives the first node that is equal to the key, null if there is none.
+KvoSkipList::SLNode* KvoSkipList::walk(const void* key, SLNode** update) const
 {
+    auto* wanted = const_cast<void*>(key);
     SLNode* node = header;
-    const SLNode* stopped = nullptr;
+    SLNode* stopped = nullptr;
+    bool equal = false;
     for (int i = levels - 1; i >= 0; --i) {
-        SLNode* next = node->forward[i];
-        while (next && next != stopped && compare(next, key) < 0) {
+        SLNode* next = forwards_behind(node)[i];
+        while (next && next != stopped) {
+            fetch_ahead(node, next, i);
+            const int order = compare(next, wanted);
+            if (order >= 0) {
+                equal = order == 0;
+                break;
+            }
             node = next;
-            next = node->forward[i];
+            next = forwards_behind(node)[i];
         }
         stopped = next;
         update[i] = node;
     }
-    current = update[0];
+    current = node;
+    return equal ? stopped : nullptr;
 }
 
-// Moves the cursor to where the walk ends.
-KvoSkipList::SLNode* KvoSkipList::first_equal(const void* key) const
+// Steps over the node behind `update[0]` and gives the next one if that is
+// equal to the key too.
+KvoSkipList::SLNode* KvoSkipList::step_over(SLNode* node, void* key,
+                                            SLNode** update) const
 {
-    SLNode* update[max_levels];
-    void* wanted = const_cast<void*>(key);
-    walk(wanted, update);
-    SLNode* next = current->forward[0];
-    return next && compare(next, wanted) == 0 ? next : nullptr;
-}
-
-// Steps over `next`, the node behind `update[0]`, on every level.
-void KvoSkipList::step_over(SLNode* next, SLNode** update) const
-{
-    for (int i = 0; i < levels && update[i]->forward[i] == next; ++i)
-        update[i] = next;
+    for (int i = 0; i < levels && update[i]->forward[i] == node; ++i)
+        update[i] = node;
+    SLNode* next = node->forward[0];
+    return next && compare(next, key) == 0 ? next : nullptr;
 }
 
 void KvoSkipList::Insert(KvoObject* object)
@@ -210,23 +230,17 @@ void KvoSkipList::Insert(KvoObject* object)
         return;
     SLNode* update[max_levels];
     void* key = object->Key();
-    walk(key, update);
-    SLNode* next;
-    while ((next = update[0]->forward[0]) && compare(next, key) == 0)
-        step_over(next, update);
+    SLNode* equal = walk(key, update);
+    while (equal)
+        equal = step_over(equal, key, update);
     current = update[0];
     insert_after(update, object);
 }
 
 int KvoSkipList::InsertUnique(KvoObject* object)
 {
-    if (!object)
-        return 0;
     SLNode* update[max_levels];
-    void* key = object->Key();
-    walk(key, update);
-    SLNode* next = update[0]->forward[0];
-    if (next && compare(next, key) == 0)
+    if (!object || walk(object->Key(), update))
         return 0;
     return insert_after(update, object);
 }
@@ -255,24 +269,17 @@ KvoObject* KvoSkipList::Remove(KvoObject* object)
         return nullptr;
     SLNode* update[max_levels];
     void* key = object->Key();
-    walk(key, update);
-    SLNode* next;
-    while ((next = update[0]->forward[0]) && compare(next, key) == 0) {
-        if (next->object == object)
-            return take_out(next, update);
-        step_over(next, update);
-    }
-    return nullptr;
+    SLNode* equal = walk(key, update);
+    while (equal && equal->object != object)
+        equal = step_over(equal, key, update);
+    return equal ? take_out(equal, update) : nullptr;
 }
 
 KvoObject* KvoSkipList::RemoveKey(const void* key)
 {
     SLNode* update[max_levels];
-    void* wanted = const_cast<void*>(key);
-    walk(wanted, update);
-    SLNode* next = update[0]->forward[0];
-    return next && compare(next, wanted) == 0 ? take_out(next, update)
-                                              : nullptr;
+    SLNode* equal = walk(key, update);
+    return equal ? take_out(equal, update) : nullptr;
 }
 
 KvoObject* KvoSkipList::take_out(SLNode* node, SLNode** update)
@@ -299,7 +306,7 @@ KvoSkipList* KvoSkipList::Split(const void* key)
     if (!rest)
         return nullptr;
     SLNode* update[max_levels];
-    walk(const_cast<void*>(key), update);
+    walk(key, update);
     for (int i = 0; i < levels; ++i) {
         rest->header->forward[i] = update[i]->forward[i];
         update[i]->forward[i] = nullptr;
@@ -317,17 +324,19 @@ KvoSkipList* KvoSkipList::Split(const void* key)
 
 KvoObject* KvoSkipList::Search(const void* key) const
 {
-    SLNode* found = first_equal(key);
-    if (!found)
+    SLNode* update[max_levels];
+    SLNode* equal = walk(key, update);
+    if (!equal)
         return nullptr;
-    current = found;
-    return found->object;
+    current = equal;
+    return equal->object;
 }
 
 KvoObject* KvoSkipList::SearchAlmost(const void* key) const
 {
-    if (SLNode* found = first_equal(key))
-        current = found;
+    SLNode* update[max_levels];
+    if (SLNode* equal = walk(key, update))
+        current = equal;
     return current == header ? nullptr : current->object;
 }
 
@@ -344,13 +353,6 @@ KvoObject* KvoSkipList::Tail() const
         while (current->forward[i])
             current = current->forward[i];
     return current == header ? nullptr : current->object;
-}
-
-KvoObject* KvoSkipList::Next() const
-{
-    if (current)
-        current = current->forward[0];
-    return current ? current->object : nullptr;
 }
 
 KvoObject* KvoSkipList::Peek() const
