@@ -140,7 +140,7 @@ public:
 private:
     friend class KvoTokenList;
     friend class KvoTokenReader;
-    static constexpr std::size_t room_bytes = 24;
+    static constexpr int room_bytes = 24;
 
     static KvoSkipList& action_tables();
     static const ActionTable* action_table(const char* special_characters);
@@ -266,22 +266,35 @@ protected:
     /// Requires: 0 <= index, 0 <= removed, index + removed <= `Count()`.
     void remove_tokens(int index, int removed);
 
+    /// Gives the token at `index`.
+    ///
+    /// Requires: the position is in the list.
+    KvoToken* token_at(int index) const;
+
     /// Exchanges two tokens.
     ///
     /// Requires: both positions are in the list.
     void swap_tokens(int one, int other);
 
-    /// Reads as `Append` does.
-    ///
-    /// Returns: whether every token read could be kept; false only when there
-    ///          was no memory, and the rest of the run is then dropped.
-    bool append_run(std::istream& in);
+    /// How the reading of a run went.
+    enum class Run {
+        Plain, ///< Every token is made of a few ordinary characters, the first
+               ///< of them not the mark.
+        Mixed, ///< There may be others.
+        Cut    ///< There was no memory for a token; the rest was dropped.
+    };
+
+    /// Reads as `Append` does and says what sort of tokens were added.
+    Run append_run(std::istream& in, char mark);
 
 private:
-    KvoToken* token_at(int index) const;
+    friend class KvoTokenReader;
+
     KvoToken* spare_token();
+    KvoToken* make_spare_token();
     void copy_tokens(const KvoTokenList& other);
     void trim_spares(int fresh);
+    bool is_end_character(char character) const;
     bool ends_run(const KvoToken& token) const;
     void drop_run(std::istream& in, KvoTokenReader& reader) const;
 
@@ -290,7 +303,44 @@ private:
     /// that reading statement after statement needs no memory.
     KvoObjArray tokens;
     int count; ///< How many of `tokens` are the list's.
+    /// Whether a token may have come to hold a text too long for a spare one.
+    mutable bool long_texts;
     char* end; ///< The end characters, the list's own copy.
 };
+
+inline KvoToken* KvoTokenList::token_at(int index) const
+{
+    return static_cast<KvoToken*>(static_cast<KvoObject**>(tokens.data)[index]);
+}
+
+inline void KvoTokenList::swap_tokens(int one, int other)
+{
+    KvoObject** all = static_cast<KvoObject**>(tokens.data);
+    KvoObject* kept = all[one];
+    all[one] = all[other];
+    all[other] = kept;
+}
+
+// Gives the first token behind the list's own, like the model in all but its
+// text and quote character, which the caller sets; null when there is no memory
+// for one.
+inline KvoToken* KvoTokenList::spare_token()
+{
+    KvoToken* token =
+        count < tokens.size ? token_at(count) : make_spare_token();
+    if (token) {
+        token->table = model.table;
+        token->modified = 0;
+    }
+    return token;
+}
+
+inline bool KvoTokenList::is_end_character(char character) const
+{
+    for (const char* c = end; c && *c; ++c)
+        if (*c == character)
+            return true;
+    return false;
+}
 
 #endif

@@ -15,6 +15,10 @@
 
 #include <iosfwd>
 
+namespace zt_command {
+class DirectiveIndex;
+}
+
 /// What a command word does. Names match without regard to the case of ASCII
 /// letters.
 class ZT_API ZtDirective : public KvoNamedObject
@@ -95,8 +99,11 @@ public:
     void Info(std::ostream& out, int number);
 
 private:
+    ZtDirective* find(const char* word) const;
+
     KvoSkipList directives;
     KvoObjArray each; ///< In the order of registration, not owned.
+    zt_command::DirectiveIndex* index; ///< Speeds `find` up; may be null.
 };
 
 /// Registers several directives, each with a selector number, that all come

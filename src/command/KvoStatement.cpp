@@ -19,18 +19,19 @@ KvoStatement::KvoStatement(int argc, const char* const* argv)
 }
 
 // Cleaning always starts at position 0, and a second pass over the same tokens
-// may drop what the first one passed over; but once a pass has dropped nothing
-// a further one need only be made when there are new tokens.
+// may drop what the first one passed over. But a pass that dropped nothing need
+// not be repeated until there are new tokens, and none that is plain is
+// dropped.
 void KvoStatement::Append(std::istream& in)
 {
     const int held = Count();
-    bool settled = false;
+    bool clean = held == 0;
     do {
-        const int before = Count();
-        if (!append_run(in) || !in.good())
+        const Run run = append_run(in, '#');
+        if (run == Run::Cut || !in.good())
             return;
-        if (!settled || Count() != before)
-            settled = drop_comments_and_continuations() == 0;
+        if (run == Run::Mixed || !clean)
+            clean = drop_comments_and_continuations() == 0;
     } while (Count() == held);
 }
 
@@ -124,14 +125,17 @@ int KvoStatement::drop_comments_and_continuations()
     const int all = Count();
     int kept = 0;
     for (int i = 0; i < all; ++i) {
-        const char first = ArgText(i)[0];
+        const char first = token_at(i)->Text()[0];
         if (first == '!' || first == '#')
             break;
         if (first == '\n' && ++i == all)
             break;
-        swap_tokens(kept++, i);
+        if (kept != i)
+            swap_tokens(kept, i);
+        ++kept;
     }
-    remove_tokens(kept, all - kept);
+    if (kept != all)
+        remove_tokens(kept, all - kept);
     return all - kept;
 }
 

@@ -5,7 +5,6 @@
 #include <cstring>
 #include <memory>
 #include <new>
-#include <utility>
 
 #include "command/token_reader.h"
 #include "command/write_text.h"
@@ -37,7 +36,7 @@ std::unique_ptr<char[]> joined(const char* first, const char* second)
 KvoTokenList::KvoTokenList(const char* special_characters,
                            const char* end_characters)
     : model(joined(special_characters, end_characters).get()), tokens(),
-      count(0), end(KvoNewString(end_characters))
+      count(0), long_texts(false), end(KvoNewString(end_characters))
 {}
 
 KvoTokenList::KvoTokenList(const KvoTokenList& other)
@@ -74,7 +73,7 @@ void KvoTokenList::Clear()
 
 void KvoTokenList::Append(std::istream& in)
 {
-    append_run(in);
+    append_run(in, '\0');
 }
 
 void KvoTokenList::Read(std::istream& in)
@@ -108,6 +107,7 @@ KvoToken* KvoTokenList::Find(const char* text) const
 
 KvoToken* KvoTokenList::Find(int index) const
 {
+    long_texts = true; // the caller may set one
     return index >= 0 && index < count ? token_at(index) : nullptr;
 }
 
@@ -134,8 +134,7 @@ int KvoTokenList::Replace(int index, const char* text)
 
 const char* KvoTokenList::ArgText(int index) const
 {
-    const KvoToken* token = Find(index);
-    return token ? token->text : nullptr;
+    return index >= 0 && index < count ? token_at(index)->text : nullptr;
 }
 
 int KvoTokenList::ArgInt(int index) const
@@ -153,6 +152,7 @@ KvoToken* KvoTokenList::append_token(const char* text)
     KvoToken* token = spare_token();
     if (token) {
         token->Set(text);
+        long_texts = true;
         ++count;
     }
     return token;
@@ -160,23 +160,29 @@ KvoToken* KvoTokenList::append_token(const char* text)
 
 // A token that is read stands behind the list's own until it proves to be more
 // than the end of the run.
-bool KvoTokenList::append_run(std::istream& in)
+KvoTokenList::Run KvoTokenList::append_run(std::istream& in, char mark)
 {
+    Run run = Run::Plain;
     if (!in.good())
-        return true;
+        return run;
     KvoTokenReader reader(in);
     do {
+        reader.read_plain_tokens(*this, mark);
+        if (reader.take_end(*this))
+            return run;
         KvoToken* token = spare_token();
         if (!token) {
             drop_run(in, reader);
-            return false;
+            return Run::Cut;
         }
         reader.read(*token);
+        long_texts = long_texts || token->capacity > most_spare_text_bytes;
         if (ends_run(*token))
-            return true;
+            return run;
         ++count;
+        run = Run::Mixed;
     } while (in.good());
-    return true;
+    return run;
 }
 
 // Reads the rest of a run into a token that needs no memory to be made.
@@ -190,45 +196,28 @@ void KvoTokenList::drop_run(std::istream& in, KvoTokenReader& reader) const
 
 void KvoTokenList::remove_tokens(int index, int removed)
 {
-    if (removed == 0)
-        return;
     KvoObject** all = static_cast<KvoObject**>(tokens.data);
-    std::rotate(all + index, all + index + removed, all + count);
+    if (index + removed < count)
+        std::rotate(all + index, all + index + removed, all + count);
     count -= removed;
-    trim_spares(removed);
+    if (long_texts || tokens.size - count > most_spare_tokens)
+        trim_spares(removed);
 }
 
-void KvoTokenList::swap_tokens(int one, int other)
+// Adds a token behind all others for the list to use; null when there is no
+// memory for one.
+KvoToken* KvoTokenList::make_spare_token()
 {
-    KvoObject** all = static_cast<KvoObject**>(tokens.data);
-    std::swap(all[one], all[other]);
-}
-
-KvoToken* KvoTokenList::token_at(int index) const
-{
-    return static_cast<KvoToken*>(static_cast<KvoObject**>(tokens.data)[index]);
-}
-
-// Gives the first token behind the list's own, like the model in all but its
-// text, which the caller sets; null when there is no memory for one.
-KvoToken* KvoTokenList::spare_token()
-{
-    if (count == tokens.size) {
-        if (count == INT_MAX)
-            return nullptr;
-        auto* made = new (std::nothrow) KvoToken(model);
-        if (!made)
-            return nullptr;
-        tokens.Insert(made, count);
-        if (tokens.size == count) {
-            delete made;
-            return nullptr;
-        }
-    }
-    KvoToken* token = token_at(count);
-    token->table = model.table;
-    token->modified = 0;
-    return token;
+    if (count == INT_MAX)
+        return nullptr;
+    auto* made = new (std::nothrow) KvoToken(model);
+    if (!made)
+        return nullptr;
+    tokens.Insert(made, count);
+    if (tokens.size > count)
+        return made;
+    delete made;
+    return nullptr;
 }
 
 void KvoTokenList::copy_tokens(const KvoTokenList& other)
@@ -238,6 +227,7 @@ void KvoTokenList::copy_tokens(const KvoTokenList& other)
         if (!token)
             return;
         *token = *other.token_at(i);
+        long_texts = true;
         ++count;
     }
 }
@@ -252,14 +242,11 @@ void KvoTokenList::trim_spares(int fresh)
     for (int i = count; i < last; ++i)
         if (token_at(i)->capacity > most_spare_text_bytes)
             token_at(i)->release_text();
+    long_texts = count > 0;
 }
 
 bool KvoTokenList::ends_run(const KvoToken& token) const
 {
-    if (token.quote)
-        return false;
-    bool ends = token.length == 0;
-    for (const char* c = end; !ends && c && *c; ++c)
-        ends = token.text[0] == *c;
-    return ends;
+    return !token.quote &&
+           (token.length == 0 || is_end_character(token.text[0]));
 }

@@ -3,6 +3,7 @@
 #include <new>
 
 #include "ZT/error.h"
+#include "command/directive_index.h"
 #include "command/fold_case.h"
 #include "command/write_text.h"
 #include "core/number_text.h"
@@ -34,23 +35,32 @@ void ZtDirective::Info(std::ostream& out, int)
     write_indented(out, name);
 }
 
-ZtDispatcher::ZtDispatcher() = default;
+ZtDispatcher::ZtDispatcher()
+    : index(new (std::nothrow) zt_command::DirectiveIndex)
+{}
 
 ZtDispatcher::~ZtDispatcher()
 {
+    delete index;
     directives.DeleteContents();
 }
 
 void ZtDispatcher::Add(ZtDirective* directive)
 {
-    if (directive)
-        directives.Insert(directive);
+    if (!directive)
+        return;
+    directives.Insert(directive);
+    if (index)
+        index->Forget();
 }
 
 void ZtDispatcher::Remove(ZtDirective* directive)
 {
-    if (directive)
-        directives.Remove(directive);
+    if (!directive)
+        return;
+    directives.Remove(directive);
+    if (index)
+        index->Forget();
 }
 
 void ZtDispatcher::EachAdd(ZtDirective* directive)
@@ -75,14 +85,20 @@ void ZtDispatcher::Delegate(KvoStatement* statement)
     const char* word = statement->ArgText(0);
     if (!word)
         return;
-    if (KvoObject* named = directives.Search(word))
-        return static_cast<ZtDirective*>(named)->Act(statement);
+    if (ZtDirective* named = find(word))
+        return named->Act(statement);
     if (auto* error = new (std::nothrow) ZtErr("Warning: ", 0, 3)) {
         error->stream << "Unknown command: ";
         statement->Write(error->stream);
         error->stream << "\n";
         error->Post();
     }
+}
+
+ZtDirective* ZtDispatcher::find(const char* word) const
+{
+    KvoObject* found = index ? index->Find(directives, word) : nullptr;
+    return static_cast<ZtDirective*>(found ? found : directives.Search(word));
 }
 
 // Walks the nodes, not the list's cursor, which a directive may move.

@@ -7,10 +7,10 @@
 
 namespace zt_command {
 /// Gives the small letter for a capital one, everything else as it is.
-inline int folded(char character)
+inline unsigned folded(char character)
 {
-    const int code = static_cast<unsigned char>(character);
-    return code >= 'A' && code <= 'Z' ? code - 'A' + 'a' : code;
+    const unsigned code = static_cast<unsigned char>(character);
+    return code - 'A' < 26u ? code + ('a' - 'A') : code;
 }
 
 /// Compares two texts, a null one being the empty text.
@@ -21,11 +21,16 @@ inline int compare_folded(const char* one, const char* other)
 {
     one = one ? one : "";
     other = other ? other : "";
-    while (*one && folded(*one) == folded(*other)) {
-        ++one;
-        ++other;
+    for (;; ++one, ++other) {
+        if (*one != *other) {
+            const int difference = static_cast<int>(folded(*one)) -
+                                   static_cast<int>(folded(*other));
+            if (difference != 0)
+                return difference;
+        } else if (*one == '\0') {
+            return 0;
+        }
     }
-    return folded(*one) - folded(*other);
 }
 } // namespace zt_command
 

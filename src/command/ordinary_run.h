@@ -2,101 +2,78 @@
 #define ZT_COMMAND_ORDINARY_RUN_H
 
 /// \file
-/// Finds the end of a run of ordinary characters sixteen at a time.
+/// Finds where runs of ordinary characters end, many characters at a time.
 ///
-/// A character ends the run if it is a control character or the space, a quote,
-/// the backslash, or one of four given stops. On machines without the
-/// instructions for it, chunks are looked at character by character with the
-/// same result.
+/// A character ends a run if it is a control character or the space, a quote,
+/// the backslash, or one of four given stops.
+
+#include <bit>
+#include <cstdint>
 
 #if defined(__SSE2__)
 #include <emmintrin.h>
 #endif
 
-#include <cstring>
-
 namespace zt_command {
 constexpr int chunk_bytes = 16;
+constexpr int block_bytes = 64;
 constexpr int stop_count = 4;
 
 /// The stops, each filling a chunk of its own.
 using Stops = char[stop_count][chunk_bytes];
 
-#if defined(__SSE2__)
-
-/// Gives a bit for each of the characters at `from` that ends a run.
-inline unsigned ends_in_chunk(__m128i chunk, const Stops& stops)
+/// Gives a bit for each of the sixteen characters at `from` that ends a run,
+/// the lowest for the first.
+inline std::uint32_t ends_in_chunk(const char* from, const Stops& stops)
 {
+#if defined(__SSE2__)
+    const auto load = [](const char* chunk) {
+        return _mm_loadu_si128(reinterpret_cast<const __m128i*>(chunk));
+    };
+    const __m128i chunk = load(from);
     // At most a space, unsigned: the smaller of the two is the character.
-    __m128i end =
+    __m128i ends =
         _mm_cmpeq_epi8(_mm_min_epu8(chunk, _mm_set1_epi8(' ')), chunk);
     for (const char fixed : {'"', '\'', '\\'})
-        end = _mm_or_si128(end, _mm_cmpeq_epi8(chunk, _mm_set1_epi8(fixed)));
+        ends = _mm_or_si128(ends, _mm_cmpeq_epi8(chunk, _mm_set1_epi8(fixed)));
     for (const auto& stop : stops)
-        end = _mm_or_si128(
-            end,
-            _mm_cmpeq_epi8(chunk, _mm_loadu_si128(
-                                      reinterpret_cast<const __m128i*>(stop))));
-    return static_cast<unsigned>(_mm_movemask_epi8(end));
+        ends = _mm_or_si128(ends, _mm_cmpeq_epi8(chunk, load(stop)));
+    return static_cast<std::uint32_t>(_mm_movemask_epi8(ends));
+#else
+    std::uint32_t ends = 0;
+    for (int i = 0; i < chunk_bytes; ++i) {
+        const char c = from[i];
+        bool end = static_cast<unsigned char>(c) <= ' ' || c == '"' ||
+                   c == '\'' || c == '\\';
+        for (const auto& stop : stops)
+            end = end || c == stop[0];
+        ends |= std::uint32_t{end} << i;
+    }
+    return ends;
+#endif
 }
 
-/// Copies the sixteen characters at `from` to `to`.
-///
-/// Returns: how many of them stand before the first that ends a run.
-inline int copy_ordinary_chunk(char* to, const char* from, const Stops& stops)
+/// Does the same for the sixty-four characters at `from`.
+inline std::uint64_t ends_in_block(const char* from, const Stops& stops)
 {
-    const __m128i chunk =
-        _mm_loadu_si128(reinterpret_cast<const __m128i*>(from));
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(to), chunk);
-    const unsigned ends = ends_in_chunk(chunk, stops);
-    return ends ? __builtin_ctz(ends) : chunk_bytes;
+    std::uint64_t ends = 0;
+    for (int i = 0; i < block_bytes; i += chunk_bytes)
+        ends |= std::uint64_t{ends_in_chunk(from + i, stops)} << i;
+    return ends;
 }
 
-/// Steps over chunks of ordinary characters as long as a whole one is left.
+/// Steps over ordinary characters as long as a whole chunk is left.
 ///
 /// Returns: the first character that ends a run, or where fewer than sixteen
 ///          are left before `limit`.
 inline const char* skip_ordinary_chunks(const char* from, const char* limit,
                                         const Stops& stops)
 {
-    for (; limit - from >= chunk_bytes; from += chunk_bytes) {
-        const unsigned ends = ends_in_chunk(
-            _mm_loadu_si128(reinterpret_cast<const __m128i*>(from)), stops);
-        if (ends)
-            return from + __builtin_ctz(ends);
-    }
+    for (; limit - from >= chunk_bytes; from += chunk_bytes)
+        if (const std::uint32_t ends = ends_in_chunk(from, stops))
+            return from + std::countr_zero(ends);
     return from;
 }
-
-#else
-
-inline bool ends_run(char character, const Stops& stops)
-{
-    for (const auto& stop : stops)
-        if (character == stop[0])
-            return true;
-    return static_cast<unsigned char>(character) <= ' ' || character == '"' ||
-           character == '\'' || character == '\\';
-}
-
-inline int copy_ordinary_chunk(char* to, const char* from, const Stops& stops)
-{
-    std::memcpy(to, from, chunk_bytes);
-    int bytes = 0;
-    while (bytes < chunk_bytes && !ends_run(from[bytes], stops))
-        ++bytes;
-    return bytes;
-}
-
-inline const char* skip_ordinary_chunks(const char* from, const char* limit,
-                                        const Stops& stops)
-{
-    while (limit - from >= chunk_bytes && !ends_run(*from, stops))
-        ++from;
-    return from;
-}
-
-#endif
 } // namespace zt_command
 
 #endif

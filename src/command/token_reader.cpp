@@ -1,5 +1,6 @@
 #include "command/token_reader.h"
 
+#include <bit>
 #include <cstring>
 
 #include "command/ordinary_run.h"
@@ -127,59 +128,10 @@ void KvoTokenReader::put_back_into_stream(char character)
 
 void KvoTokenReader::read(KvoToken& token)
 {
+    const KvoToken::ActionTable& table = *token.table;
     token.quote = 0;
     token.clear_text();
-    skip_blanks(*token.table);
-    if (!read_whole_short_token(token))
-        read_pieces(token);
-}
-
-// The character that stops the skipping goes back. In view it only has to be
-// left; one that the stream gave out is put back into it, which may fail.
-void KvoTokenReader::skip_blanks(const KvoToken::ActionTable& table)
-{
-    constexpr int blank_or_special =
-        KvoToken::ActionTable::Blank | KvoToken::ActionTable::Special;
-    char character;
-    do {
-        while (at != limit && (table.ActionOf(*at) & blank_or_special) ==
-                                  KvoToken::ActionTable::Blank)
-            ++at;
-        if (at != limit || !take_from_stream(character))
-            return;
-    } while ((table.ActionOf(character) & blank_or_special) ==
-             KvoToken::ActionTable::Blank);
-    put_back_into_stream(character);
-}
-
-// Most tokens are a few ordinary characters before a blank or a special
-// character, all of them in view: they are found and copied by one step of a
-// scan that takes sixteen at a time. Whatever is not that simple is left to
-// `read_pieces`, with nothing taken.
-bool KvoTokenReader::read_whole_short_token(KvoToken& token)
-{
-    const KvoToken::ActionTable& table = *token.table;
-    if (!table.vector_scannable || limit - at < zt_command::chunk_bytes)
-        return false;
-    const int bytes =
-        zt_command::copy_ordinary_chunk(token.text, at, table.vector_stops);
-    const int stop =
-        bytes < zt_command::chunk_bytes ? table.ActionOf(at[bytes]) : 0;
-    const bool special = stop & KvoToken::ActionTable::Special;
-    if (bytes == 0 || (!special && stop != KvoToken::ActionTable::Blank)) {
-        token.clear_text();
-        return false;
-    }
-    token.length = static_cast<std::size_t>(bytes);
-    token.text[bytes] = '\0';
-    at += special ? bytes : bytes + 1;
-    pending = special ? Pending::PutBack : Pending::Took;
-    return true;
-}
-
-void KvoTokenReader::read_pieces(KvoToken& token)
-{
-    const KvoToken::ActionTable& table = *token.table;
+    skip_blanks(table);
     char character;
     while (take(character)) {
         const int action = table.ActionOf(character);
@@ -203,6 +155,24 @@ void KvoTokenReader::read_pieces(KvoToken& token)
             take_ordinary(token);
         }
     }
+}
+
+// The character that stops the skipping goes back. In view it only has to be
+// left; one that the stream gave out is put back into it, which may fail.
+void KvoTokenReader::skip_blanks(const KvoToken::ActionTable& table)
+{
+    constexpr int blank_or_special =
+        KvoToken::ActionTable::Blank | KvoToken::ActionTable::Special;
+    char character;
+    do {
+        while (at != limit && (table.ActionOf(*at) & blank_or_special) ==
+                                  KvoToken::ActionTable::Blank)
+            ++at;
+        if (at != limit || !take_from_stream(character))
+            return;
+    } while ((table.ActionOf(character) & blank_or_special) ==
+             KvoToken::ActionTable::Blank);
+    put_back_into_stream(character);
 }
 
 // Takes what is in view of a run of ordinary characters. What comes behind the
@@ -250,4 +220,83 @@ void KvoTokenReader::take_escaped(KvoToken& token)
     char character;
     if (take(character))
         token.append_text(&character, 1);
+}
+
+void KvoTokenReader::read_plain_tokens(KvoTokenList& list, char mark)
+{
+    const KvoToken::ActionTable& table = *list.model.table;
+    if (!table.vector_scannable)
+        return;
+    while (limit - at >= zt_command::block_bytes) {
+        const std::uint64_t ends =
+            zt_command::ends_in_block(at, table.vector_stops);
+        if (ends == 0 || !read_mapped_tokens(list, ends, mark))
+            return;
+    }
+}
+
+// Most tokens are a few ordinary characters before a blank or a special one.
+// `ends` is a map of the characters in view that end such a run: the length of
+// a token is the number of clear bits at its low end, and what is taken is
+// shifted out. The position is kept in a variable of the function's own, since
+// every copy into a token could change a member for all the compiler knows.
+//
+// Returns: whether everything in the map was taken, but for a token that goes
+//          on behind it.
+bool KvoTokenReader::read_mapped_tokens(KvoTokenList& list, std::uint64_t ends,
+                                        char mark)
+{
+    const KvoToken::ActionTable& table = *list.model.table;
+    const char* here = at;
+    while (ends != 0) {
+        const int bytes = std::countr_zero(ends);
+        const int stop = table.ActionOf(here[bytes]);
+        const bool blank = stop == KvoToken::ActionTable::Blank;
+        if (bytes > 0) {
+            if (*here == mark ||
+                !(blank || stop & KvoToken::ActionTable::Special) ||
+                !add_plain_token(list, here, bytes))
+                break;
+        } else if (!blank) {
+            break;
+        }
+        here += bytes;
+        ends >>= bytes;
+        pending = Pending::PutBack;
+        if (blank) [[likely]] {
+            ++here;
+            ends >>= 1;
+            pending = Pending::Took;
+        }
+    }
+    at = here;
+    return ends == 0;
+}
+
+// A copy of one size, whatever the token's, costs least; so the token must fit
+// it and there must be as much in view.
+bool KvoTokenReader::add_plain_token(KvoTokenList& list, const char* from,
+                                     int bytes) const
+{
+    constexpr int copied = KvoToken::room_bytes;
+    if (bytes >= copied || limit - from < copied)
+        return false;
+    KvoToken* token = list.spare_token();
+    if (!token)
+        return false;
+    std::memcpy(token->text, from, copied);
+    token->text[bytes] = '\0';
+    token->length = static_cast<std::size_t>(bytes);
+    token->quote = 0;
+    ++list.count;
+    return true;
+}
+
+bool KvoTokenReader::take_end(const KvoTokenList& list)
+{
+    if (at == limit || !list.is_end_character(*at))
+        return false;
+    ++at;
+    pending = Pending::Took;
+    return true;
 }

@@ -14,6 +14,7 @@
 #include <KVO/KvoToken.h>
 
 #include <cstddef>
+#include <cstdint>
 #include <istream>
 #include <streambuf>
 
@@ -33,6 +34,17 @@ public:
     /// Reads the next token with the token's own action table.
     void read(KvoToken& token);
 
+    /// Adds to `list` the plain tokens that come next: a few ordinary
+    /// characters, the first of them not `mark`, before a blank or a special
+    /// one, all in the stream's buffer. Anything else is left to `read`.
+    void read_plain_tokens(KvoTokenList& list, char mark);
+
+    /// Takes the next character if it is in the stream's buffer and ends the
+    /// list's run.
+    ///
+    /// Returns: whether it was taken.
+    bool take_end(const KvoTokenList& list);
+
 private:
     /// What was last done to the characters in view and not yet to the stream.
     enum class Pending { Nothing, Took, PutBack };
@@ -45,8 +57,8 @@ private:
     void tell_buffer();
 
     void skip_blanks(const KvoToken::ActionTable& table);
-    bool read_whole_short_token(KvoToken& token);
-    void read_pieces(KvoToken& token);
+    bool read_mapped_tokens(KvoTokenList& list, std::uint64_t ends, char mark);
+    bool add_plain_token(KvoTokenList& list, const char* from, int bytes) const;
     void take_ordinary(KvoToken& token);
     void take_quoted(KvoToken& token);
     void take_escaped(KvoToken& token);
