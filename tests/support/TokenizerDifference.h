@@ -1,0 +1,94 @@
+#ifndef ZT_TESTS_TOKENIZERDIFFERENCE_H
+#define ZT_TESTS_TOKENIZERDIFFERENCE_H
+
+#include <istream>
+#include <sstream>
+#include <string>
+#include <vector>
+
+#include "KVO/KvoStatement.h"
+#include "support/LiteralTokenizer.h"
+#include "support/OddStreams.h"
+
+/// Reads the library's tokens and the literal ones from two streams of the same
+/// text and tells the first difference that shows; empty if there is none.
+class TokenizerDifference
+{
+public:
+    TokenizerDifference(std::istream& tested_stream,
+                        std::istream& reference_stream)
+        : tested(tested_stream), reference(reference_stream)
+    {}
+
+    /// Reads up to `most` tokens of a special set.
+    std::string OfTokens(const std::string& special, int most)
+    {
+        const LiteralTokenizer literal(special, "");
+        KvoToken token(special.c_str());
+        for (int i = 0; i < most && difference.empty(); ++i) {
+            token.Read(tested);
+            compare(token, literal.ReadToken(reference));
+            compare_streams();
+            if (!tested.good() && i + 2 < most)
+                i = most - 2; // once more from the stream that is not good
+        }
+        return difference;
+    }
+
+    /// Reads up to `most` statements, and compares what is left.
+    std::string OfStatements(int most)
+    {
+        const LiteralTokenizer literal("!", ";\n");
+        KvoStatement statement;
+        for (int i = 0; i < most && difference.empty() && tested.good(); ++i) {
+            std::vector<LiteralToken> expected;
+            literal.AppendStatement(reference, expected);
+            statement.Read(tested);
+            if (statement.Count() != static_cast<int>(expected.size()))
+                note("count", statement.Count(), expected.size());
+            for (int k = 0; k < statement.Count() && difference.empty(); ++k)
+                compare(*statement.Find(k),
+                        expected[static_cast<std::size_t>(k)]);
+            compare_streams();
+        }
+        if (difference.empty() && RestOf(tested) != RestOf(reference))
+            note("rest", "another", "one");
+        return difference;
+    }
+
+private:
+    void compare(const KvoToken& token, const LiteralToken& expected)
+    {
+        // Texts are C strings: what stands behind a NUL does not show.
+        const std::string text = token.Text();
+        if (text != expected.text.c_str())
+            note("text", text, expected.text);
+        if (token.Quote() != expected.quote)
+            note("quote", token.Quote(), expected.quote);
+    }
+
+    void compare_streams()
+    {
+        if (tested.rdstate() != reference.rdstate())
+            note("state", tested.rdstate(), reference.rdstate());
+        if (tested.gcount() != reference.gcount())
+            note("gcount", tested.gcount(), reference.gcount());
+        if (tested.good() && tested.tellg() != reference.tellg())
+            note("position", tested.tellg(), reference.tellg());
+    }
+
+    template <typename Value, typename Expected>
+    void note(const char* what, const Value& value, const Expected& expected)
+    {
+        std::ostringstream text;
+        text << what << ": " << value << " instead of " << expected;
+        if (difference.empty())
+            difference = text.str();
+    }
+
+    std::istream& tested;
+    std::istream& reference;
+    std::string difference;
+};
+
+#endif
