@@ -138,16 +138,25 @@ public:
     static constexpr long get_timecode_parts(long count, int* hh, int* mm,
                                              int* ss, int* ff, int fps)
     {
-        const auto near_count = static_cast<std::int32_t>(count);
-        return near_count == count ? split(near_count, hh, mm, ss, ff, fps)
-                                   : split(count, hh, mm, ss, ff, fps);
+        const long whole_hours = count / ticks_per_hour;
+        const auto in_hour =
+            static_cast<std::int32_t>(count - whole_hours * ticks_per_hour);
+        const std::int32_t whole_minutes = in_hour / ticks_per_minute;
+        const std::int32_t in_minute =
+            in_hour - whole_minutes * ticks_per_minute;
+        const std::int32_t whole_seconds = in_minute / ticks_per_second;
+        *hh = static_cast<int>(whole_hours);
+        *mm = whole_minutes;
+        *ss = whole_seconds;
+        *ff = whole_frames(in_minute - whole_seconds * ticks_per_second, fps);
+        return whole_hours;
     }
 
     /// Splits this time as `get_timecode_parts` does.
     constexpr long Timecode(int* hh, int* mm, int* ss, int* ff,
                             int fps = 0) const
     {
-        return split(tick_count, hh, mm, ss, ff, resolved(fps));
+        return get_timecode_parts(tick_count, hh, mm, ss, ff, resolved(fps));
     }
 
     /// Replaces this time as the constructor of the same fields makes it.
@@ -341,26 +350,6 @@ private:
                 FromTicks(product(ss, ticks_per_second)) +
                 FromTicks(product(ff, frame_ticks(fps))))
             .tick_count;
-    }
-
-    /// Splits in the width of `Count`: 32-bit divisions are faster than 64-bit
-    /// ones, and any time of this class fits them.
-    template <class Count>
-    static constexpr long split(Count count, int* hh, int* mm, int* ss, int* ff,
-                                int fps)
-    {
-        const Count whole_hours = count / ticks_per_hour;
-        const auto in_hour =
-            static_cast<std::int32_t>(count - whole_hours * ticks_per_hour);
-        const std::int32_t whole_minutes = in_hour / ticks_per_minute;
-        const std::int32_t in_minute =
-            in_hour - whole_minutes * ticks_per_minute;
-        const std::int32_t whole_seconds = in_minute / ticks_per_second;
-        *hh = static_cast<int>(whole_hours);
-        *mm = whole_minutes;
-        *ss = whole_seconds;
-        *ff = whole_frames(in_minute - whole_seconds * ticks_per_second, fps);
-        return whole_hours;
     }
 
     /// Gives the whole frames in `count` ticks, 0 where there is no such frame.

@@ -7,6 +7,9 @@
 #include <limits>
 #include <ostream>
 
+#include "KVO/KvoToken.h"
+
+#include "core/number_text.h"
 #include "core/truncate.h"
 
 namespace {
@@ -47,6 +50,20 @@ bool scan_integer(const char*& at, int& number)
         amount = std::min(amount * 10 + (*at - '0'), nearest_end);
     number = static_cast<int>(negative ? -amount : amount);
     return true;
+}
+
+/// Gives the integer that leads `text`, 0 if none does.
+int leading_integer(const char* text)
+{
+    int number = 0;
+    scan_integer(text, number);
+    return number;
+}
+
+bool is_separator(const KvoToken& token)
+{
+    const char* text = token.Text();
+    return !token.Quote() && (*text == ':' || *text == '.');
 }
 
 /// Writes `number`, 0 to 99, as two digits; gives the end.
@@ -182,6 +199,31 @@ void KvoTime::Write(std::ostream& out) const
     end = put_frames(end, text + sizeof text, ff);
     out.width(0);
     quietly([&] { out.write(text, end - text); });
+}
+
+void KvoTime::Read(std::istream& in)
+{
+    KvoTokenList words(":.", ";\n");
+    words.Read(in);
+    if (words.Count() == 0)
+        return;
+    if (words.Count() == 1) {
+        *this = KvoTime(zt_core::text_to_float(words.ArgText(0)));
+        return;
+    }
+    // From the last word backward: frames, seconds, minutes, hours.
+    int fields[4] = {};
+    int field = 0;
+    for (int index = words.Count() - 1; index >= 0 && field < 4;) {
+        const KvoToken& word = *words.Find(index);
+        if (is_separator(word)) {
+            index -= 1;
+        } else {
+            fields[field++] = leading_integer(word.Text());
+            index -= 2;
+        }
+    }
+    SetTimecode(fields[3], fields[2], fields[1], fields[0], 0);
 }
 
 void KvoTime::WriteBinary(std::ostream& out) const
