@@ -112,9 +112,9 @@ public:
     ///
     /// Reports:   as the other constructor.
     /// By design: an end of exactly 3 or -3 ticks makes it endless
-    ///            (ZtTimer.AnEndOfThreeTicksEitherWayMeansEndless), and equal
+    ///            (ZtTimerTest.AnEndOfThreeTicksEitherWayMeansEndless), and equal
     ///            start and end make it count down
-    ///            (ZtTimer.EqualStartAndEndCountDown).
+    ///            (ZtTimerTest.EqualStartAndEndCountDown).
     ZtTimer(KvoTime start_at, KvoTime end_at);
 
     ZtTimer(const ZtTimer&) = delete;
@@ -163,7 +163,7 @@ public:
     ///
     /// By design: it is the state at the time of asking that counts, so after
     ///            `start` in the same beat a timer is turned round while it
-    ///            runs (ZtTimer.ReverseLooksAtTheStateWhenItIsAsked).
+    ///            runs (ZtTimerTest.ReverseLooksAtTheStateWhenItIsAsked).
     void reverse();
 
     /// Asks that the timer run on from its current time; nothing if it runs.
@@ -268,7 +268,7 @@ public:
     /// Keeps the beat away by ignoring the alarm, until `unblock`.
     ///
     /// By design: blocks do not nest, one `unblock` ends them all
-    ///            (ZtTimerBeat.BlockDoesNotNest).
+    ///            (ZtTimerBeatTest.BlockDoesNotNest).
     static void block();
 
     /// Ends a block. A beat that fell due meanwhile runs at once.

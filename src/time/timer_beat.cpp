@@ -91,7 +91,9 @@ void arm_next(const timeval& began)
         ZtTimerBeat::sample_rate - 1000 * (spent > 0 ? spent : 0);
     if (wait <= 0)
         ++statistics.overruns;
-    Alarm::current().listen(on_alarm);
+    // A beat that ordinary code calls in a block of its own leaves it blocked.
+    if (ZtTimerBeat::blocked_count == 0)
+        Alarm::current().listen(on_alarm);
     zt_time::set_alarm(wait, steady);
 }
 
