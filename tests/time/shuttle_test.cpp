@@ -291,6 +291,21 @@ TEST(ZtShuttle, AStartTellsTheSubclassSpeedAndRange)
                      "pre -1.25 from 20 to 10", "play", "changed"}));
 }
 
+TEST(ZtShuttle, AStartAtSpeedZeroTellsTheOutPoint)
+{
+    RecordingShuttle shuttle;
+    shuttle.Mark(10, 20, 30);
+    shuttle.SetSpeed(0.0f, 0);
+
+    shuttle.SetState(ZtShuttle::Play, 0);
+    shuttle.SetState(ZtShuttle::Stopped, 0);
+    shuttle.SetTime(KvoTime(0, 0, 20, 0), ZtShuttle::current_time, 0);
+    shuttle.SetState(ZtShuttle::Reverse, 0);
+
+    EXPECT_EQ(shuttle.log, (Lines{"pre 0 from 20 to 30", "play", "post",
+                                  "pre -0 from 20 to 30", "play"}));
+}
+
 TEST(ZtShuttle, PlayBeginsAfterItsNotification)
 {
     RecordingShuttle shuttle;
