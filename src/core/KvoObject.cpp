@@ -148,7 +148,8 @@ KvoNamedObject::KvoNamedObject(const KvoNamedObject& other)
 
 KvoNamedObject& KvoNamedObject::operator=(const KvoNamedObject& other)
 {
-    SetName(other.name);
+    if (this != &other)
+        SetName(other.name);
     return *this;
 }
 

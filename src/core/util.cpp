@@ -81,6 +81,7 @@ zt_core::FormattedText::FormattedText(const char* format, va_list arguments)
         format = "";
     va_list again;
     va_copy(again, arguments);
+    // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): the caller's
     const int length = std::vsnprintf(local, sizeof local, format, arguments);
     if (length < 0) {
         text = format;
