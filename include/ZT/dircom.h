@@ -48,17 +48,17 @@ public:
     ///            not cleared.
     /// By design: the statement that runs into the end of the file is not
     ///            handed on
-    ///            (ZtCommonDirectives.ALastLineWithoutNewlineIsNotCarriedOut);
+    ///            (Include.ALastLineWithoutNewlineIsNotCarriedOut);
     ///            a file that cannot be opened is told on standard error, not
     ///            to the error handlers
-    ///            (ZtCommonDirectives.AMissingScriptIsToldAndTheOuterGoesOn).
+    ///            (Include.AMissingScriptIsToldAndTheOuterGoesOn).
     void Include(const char* name);
 
     /// Removes the command word and gives the rest of the statement, one blank
     /// between two words, and a newline to the shell; waits for its end.
     ///
     /// By design: quotes are not restored, so the shell interprets what was
-    ///            quoted (ZtCommonDirectives.SystemDoesNotRestoreQuotes).
+    ///            quoted (CommonDirectives.SystemDoesNotRestoreQuotes).
     void System(KvoStatement* statement);
 
 private:

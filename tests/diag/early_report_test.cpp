@@ -11,10 +11,18 @@
 
 namespace {
 
+/// A class of a host's, declared like the library's own.
+class Hosted : public KvoNamedObject
+{
+public:
+    KVO_DECLARE_CLASS_INFO();
+};
+
 struct Early
 {
     bool named_can_cast = false;
     bool names_are_there = false;
+    bool hosts_class_is_there = false;
     bool levels_are_there = false;
     bool output_is_there = false;
     char printed[64] = "";
@@ -28,6 +36,9 @@ struct Early
         names_are_there =
             std::strcmp(object.ClassName(), "KvoNamedObject") == 0 &&
             std::strcmp(object.name, "NoName") == 0;
+        Hosted hosted;
+        hosts_class_is_there = std::strcmp(hosted.ClassName(), "Hosted") == 0 &&
+                               KvoObject::classInfo.Cast(&hosted) == &hosted;
         levels_are_there =
             ZtErrHandler::outputLevel == 3 && ZtErrHandler::abortLevel == 5;
         output_is_there = ZtErrHandler::output != nullptr;
@@ -51,12 +62,15 @@ struct Early
 
 __attribute__((init_priority(101))) Early early;
 
+KVO_DEFINE_CLASS_INFO(Hosted, &KvoNamedObject::classInfo);
+
 } // namespace
 
 TEST(BeforeMain, ClassRecordsAreReady)
 {
     EXPECT_TRUE(early.named_can_cast);
     EXPECT_TRUE(early.names_are_there);
+    EXPECT_TRUE(early.hosts_class_is_there);
 }
 
 TEST(BeforeMain, LevelsAndOutputAreReady)

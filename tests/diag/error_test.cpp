@@ -1,90 +1,19 @@
 #include "ZT/error.h"
 
 #include <cerrno>
-#include <csignal>
 #include <cstring>
-#include <functional>
-#include <initializer_list>
-#include <iostream>
-#include <memory>
 #include <sstream>
 #include <string>
 
 #include <gtest/gtest.h>
 
-#include "support/CapturedStderr.h"
+#include "diag/Reports.h"
 #include "support/ErrorTrap.h"
 #include "support/FailingMemory.h"
 
-namespace {
-
-constexpr auto aborted = [](int status) {
-    return testing::KilledBySignal(SIGABRT)(status);
-};
-
-/// Puts the levels and the output stream back.
-class Reports : public testing::Test
-{
-protected:
-    ~Reports() override
-    {
-        ZtErrHandler::outputLevel = 3;
-        ZtErrHandler::abortLevel = 5;
-        ZtErrHandler::SetOutputStream(nullptr);
-    }
-
-    /// What `action` prints on standard error.
-    template <class Action>
-    static std::string Printed(Action action)
-    {
-        CapturedStderr captured;
-        action();
-        return captured.Text();
-    }
-};
-
-using ZtErrTest = Reports;
-using ZtErrCheck = Reports;
-using ZtErrHandlerTest = Reports;
-using Messages = Reports;
-
-/// Says who handles an error, then passes it on.
-class Teller : public ZtErrHandler
-{
-public:
-    explicit Teller(const char* own_name, int hold_back = 0)
-        : ZtErrHandler(hold_back), name(own_name)
-    {}
-
-    void Handle(ZtErr* error) override
-    {
-        std::cerr << name << ": ";
-        ZtErrHandler::Handle(error);
-    }
-
-private:
-    const char* name;
-};
-
-void PostText(const char* text, int level = 4)
-{
-    (new ZtErr(text, 0, level))->Post();
-}
-
-template <class Operation>
-std::ptrdiff_t SlotOf(Operation operation)
-{
-    std::ptrdiff_t word = 0;
-    static_assert(sizeof operation == 2 * sizeof word);
-    std::memcpy(&word, &operation, sizeof word);
-    return (word - 1) / static_cast<std::ptrdiff_t>(sizeof(void*));
-}
-
-} // namespace
-
 // --- errors ----------------------------------------------------------------
 
-TEST_F(ZtErrTest, KeepsItsKindLevelAndText)
+TEST(ZtErr, KeepsItsKindLevelAndText)
 {
     ZtErr error("Error: ", 3, 4);
 
@@ -94,14 +23,14 @@ TEST_F(ZtErrTest, KeepsItsKindLevelAndText)
     EXPECT_STREQ(error.Message(), "Error: ");
 }
 
-TEST_F(ZtErrTest, OfANullTextIsEmpty)
+TEST(ZtErr, OfANullTextIsEmpty)
 {
     ZtErr error(nullptr, 0, 1);
 
     EXPECT_STREQ(error.Message(), "");
 }
 
-TEST_F(ZtErrTest, KeepsTheLastSystemFailureBeforeIt)
+TEST(ZtErr, KeepsTheLastSystemFailureBeforeIt)
 {
     errno = ENOENT;
     ZtErr error("", 0, 1);
@@ -112,7 +41,7 @@ TEST_F(ZtErrTest, KeepsTheLastSystemFailureBeforeIt)
     errno = 0;
 }
 
-TEST_F(ZtErrTest, CountsEveryErrorEverMade)
+TEST(ZtErr, CountsEveryErrorEverMade)
 {
     const int before = ZtErr::count;
 
@@ -124,7 +53,7 @@ TEST_F(ZtErrTest, CountsEveryErrorEverMade)
     EXPECT_EQ(ZtErr::count, before + 3);
 }
 
-TEST_F(ZtErrTest, TakesWhatIsWrittenToItsStream)
+TEST(ZtErr, TakesWhatIsWrittenToItsStream)
 {
     ZtErr error("Warning: ", 0, 3);
 
@@ -133,7 +62,7 @@ TEST_F(ZtErrTest, TakesWhatIsWrittenToItsStream)
     EXPECT_STREQ(error.Message(), "Warning: frame 12\n");
 }
 
-TEST_F(ZtErrTest, FreezesItsTextWhenItIsFirstAsked)
+TEST(ZtErr, FreezesItsTextWhenItIsFirstAsked)
 {
     ZtErr error("one", 0, 3);
 
@@ -146,7 +75,7 @@ TEST_F(ZtErrTest, FreezesItsTextWhenItIsFirstAsked)
     EXPECT_STREQ(second, "one");
 }
 
-TEST_F(ZtErrTest, EndsItsTextAtTheFirstNul)
+TEST(ZtErr, EndsItsTextAtTheFirstNul)
 {
     ZtErr error("one", 0, 3);
 
@@ -155,7 +84,7 @@ TEST_F(ZtErrTest, EndsItsTextAtTheFirstNul)
     EXPECT_STREQ(error.Message(), "one");
 }
 
-TEST_F(ZtErrTest, WithoutMemoryHasTheEmptyText)
+TEST(ZtErr, WithoutMemoryHasTheEmptyText)
 {
     ZtErr error("one", 0, 3);
     FailingMemory none;
@@ -163,7 +92,7 @@ TEST_F(ZtErrTest, WithoutMemoryHasTheEmptyText)
     EXPECT_STREQ(error.Message(), "");
 }
 
-TEST_F(ZtErrTest, PostGivesItToTheTopHandler)
+TEST(ZtErr, PostGivesItToTheTopHandler)
 {
     ErrorTrap below, top;
 
@@ -173,18 +102,18 @@ TEST_F(ZtErrTest, PostGivesItToTheTopHandler)
     EXPECT_EQ(below.Text(), "");
 }
 
-TEST_F(ZtErrTest, AbortPostsItAndAborts)
+TEST(ZtErr, AbortPostsItAndAborts)
 {
     EXPECT_EXIT((new ZtErr("Error: lost\n", 0, 4))->Abort(), aborted,
                 "^Error: lost\n$");
 }
 
-TEST_F(ZtErrTest, AbortPrintsNothingBelowTheOutputLevel)
+TEST(ZtErr, AbortPrintsNothingBelowTheOutputLevel)
 {
     EXPECT_EXIT((new ZtErr("Debug: lost\n", 0, 1))->Abort(), aborted, "^$");
 }
 
-TEST_F(ZtErrTest, AnswersAsAPlainObject)
+TEST(ZtErr, AnswersAsAPlainObject)
 {
     ZtErr error("", 0, 1);
 
@@ -194,7 +123,7 @@ TEST_F(ZtErrTest, AnswersAsAPlainObject)
 
 // --- checks ----------------------------------------------------------------
 
-TEST_F(ZtErrCheck, OfAValueReportsZero)
+TEST(ZtErrCheck, OfAValueReportsZero)
 {
     ErrorTrap reports;
 
@@ -206,7 +135,7 @@ TEST_F(ZtErrCheck, OfAValueReportsZero)
     EXPECT_EQ(reports.reports[0].level, 4);
 }
 
-TEST_F(ZtErrCheck, OfAValueUsesTheTextGiven)
+TEST(ZtErrCheck, OfAValueUsesTheTextGiven)
 {
     ErrorTrap reports;
 
@@ -216,7 +145,7 @@ TEST_F(ZtErrCheck, OfAValueUsesTheTextGiven)
     EXPECT_EQ(reports.reports[0].level, 3);
 }
 
-TEST_F(ZtErrCheck, OfAValueIsSilentOtherwise)
+TEST(ZtErrCheck, OfAValueIsSilentOtherwise)
 {
     ErrorTrap reports;
 
@@ -226,7 +155,7 @@ TEST_F(ZtErrCheck, OfAValueIsSilentOtherwise)
     EXPECT_TRUE(reports.reports.empty());
 }
 
-TEST_F(ZtErrCheck, OfAValuePrintsWithTheDefaults)
+TEST(ZtErrCheck, OfAValuePrintsWithTheDefaults)
 {
     int result = 0;
 
@@ -237,7 +166,7 @@ TEST_F(ZtErrCheck, OfAValuePrintsWithTheDefaults)
     EXPECT_EQ(result, 0);
 }
 
-TEST_F(ZtErrCheck, OfAPointerReportsNull)
+TEST(ZtErrCheck, OfAPointerReportsNull)
 {
     ErrorTrap reports;
     int thing = 0;
@@ -253,7 +182,7 @@ TEST_F(ZtErrCheck, OfAPointerReportsNull)
     EXPECT_EQ(reports.reports[1].level, 3);
 }
 
-TEST_F(ZtErrCheck, OfAStreamReportsEveryBitOfItsState)
+TEST(ZtErrCheck, OfAStreamReportsEveryBitOfItsState)
 {
     for (const auto state :
          {std::ios::eofbit, std::ios::failbit, std::ios::badbit}) {
@@ -270,7 +199,7 @@ TEST_F(ZtErrCheck, OfAStreamReportsEveryBitOfItsState)
     }
 }
 
-TEST_F(ZtErrCheck, OfAStreamIsSilentWhenItIsGood)
+TEST(ZtErrCheck, OfAStreamIsSilentWhenItIsGood)
 {
     ErrorTrap reports;
     std::ostringstream out;
@@ -280,7 +209,7 @@ TEST_F(ZtErrCheck, OfAStreamIsSilentWhenItIsGood)
     EXPECT_TRUE(reports.reports.empty());
 }
 
-TEST_F(ZtErrCheck, OfAStreamAtItsEndPrintsWithTheDefaults)
+TEST(ZtErrCheck, OfAStreamAtItsEndPrintsWithTheDefaults)
 {
     std::istringstream in("");
     in.get();
@@ -291,7 +220,7 @@ TEST_F(ZtErrCheck, OfAStreamAtItsEndPrintsWithTheDefaults)
               "Stream Error: cut short\n");
 }
 
-TEST_F(ZtErrCheck, OfTheSystemReportsItsLastFailure)
+TEST(ZtErrCheck, OfTheSystemReportsItsLastFailure)
 {
     ErrorTrap reports;
 
@@ -311,7 +240,7 @@ TEST_F(ZtErrCheck, OfTheSystemReportsItsLastFailure)
     EXPECT_EQ(reports.reports[1].system_error, EACCES);
 }
 
-TEST_F(ZtErrCheck, OfTheSystemIsSilentWithoutAFailure)
+TEST(ZtErrCheck, OfTheSystemIsSilentWithoutAFailure)
 {
     ErrorTrap reports;
     errno = 0;
@@ -321,7 +250,7 @@ TEST_F(ZtErrCheck, OfTheSystemIsSilentWithoutAFailure)
     EXPECT_TRUE(reports.reports.empty());
 }
 
-TEST_F(ZtErrCheck, OfTheSystemKnowsFailuresWithoutAName)
+TEST(ZtErrCheck, OfTheSystemKnowsFailuresWithoutAName)
 {
     ErrorTrap reports;
     errno = 99999;
@@ -334,7 +263,7 @@ TEST_F(ZtErrCheck, OfTheSystemKnowsFailuresWithoutAName)
     EXPECT_GT(reports.Text().size(), 15u);
 }
 
-TEST_F(ZtErrCheck, AtTheAbortLevelPrintsAndAborts)
+TEST(ZtErrCheck, AtTheAbortLevelPrintsAndAborts)
 {
     EXPECT_EXIT(ZtErr::Check(0, "no way on", 5), aborted,
                 "^Error: no way on\n$");
@@ -342,7 +271,7 @@ TEST_F(ZtErrCheck, AtTheAbortLevelPrintsAndAborts)
                 "^Error: no way on\n$");
 }
 
-TEST_F(ZtErrCheck, BelowTheOutputLevelOnlyCounts)
+TEST(ZtErrCheck, BelowTheOutputLevelOnlyCounts)
 {
     const int before = ZtErr::count;
     int result = 0;
@@ -351,519 +280,4 @@ TEST_F(ZtErrCheck, BelowTheOutputLevelOnlyCounts)
 
     EXPECT_EQ(result, 1);
     EXPECT_EQ(ZtErr::count, before + 1);
-}
-
-// --- handlers --------------------------------------------------------------
-
-TEST_F(ZtErrHandlerTest, GoesOnTopAndComesOff)
-{
-    ZtErrHandler* const before = ZtErrHandler::handlerStack;
-    {
-        ZtErrHandler one(0);
-        ZtErrHandler two(1);
-
-        EXPECT_EQ(ZtErrHandler::handlerStack, &two);
-        EXPECT_EQ(two.next, &one);
-        EXPECT_EQ(one.next, before);
-        EXPECT_EQ(one.held, 0);
-        EXPECT_EQ(two.held, 1);
-        EXPECT_EQ(two.queue.count, 0);
-    }
-    EXPECT_EQ(ZtErrHandler::handlerStack, before);
-}
-
-TEST_F(ZtErrHandlerTest, PassesOnWhatItDoesNotOverride)
-{
-    ErrorTrap below;
-    ZtErrHandler plain;
-
-    PostText("Warning: first\n", 3);
-    PostText("Debug: second\n", 1);
-
-    EXPECT_EQ(below.Text(), "Warning: first\nDebug: second\n");
-}
-
-TEST_F(ZtErrHandlerTest, PassesOnToAHandlerThatHoldsBack)
-{
-    ErrorTrap below;
-    below.Hold();
-    ZtErrHandler plain;
-
-    PostText("Warning: first\n");
-
-    EXPECT_EQ(below.Text(), "");
-    EXPECT_EQ(below.queue.count, 1);
-    below.Release();
-    EXPECT_EQ(below.Text(), "Warning: first\n");
-}
-
-TEST_F(ZtErrHandlerTest, ASubclassSeesEverythingAndTheOnesBelowWhatItPassesOn)
-{
-    class OnlyErrors : public ZtErrHandler
-    {
-    public:
-        void Handle(ZtErr* error) override
-        {
-            ++seen;
-            if (error->level >= 4)
-                next->Deliver(error);
-            else
-                delete error;
-        }
-        int seen = 0;
-    };
-    ErrorTrap below;
-    OnlyErrors top;
-
-    ZtDebug("a\n");
-    ZtWarning("b\n");
-    ZtError("c\n");
-    ZtStatus("d\n");
-
-    EXPECT_EQ(top.seen, 4);
-    EXPECT_EQ(below.Text(), "Error: c\n");
-}
-
-TEST_F(ZtErrHandlerTest, HoldsBackUntilItReleasesOldestFirst)
-{
-    Teller teller("t", 1);
-
-    const std::string while_held = Printed([] {
-        PostText("one\n");
-        PostText("two\n");
-        PostText("three\n");
-    });
-    const std::string released = Printed([&] { teller.Release(); });
-
-    EXPECT_EQ(while_held, "");
-    EXPECT_EQ(released, "t: one\nt: two\nt: three\n");
-    EXPECT_EQ(teller.held, 0);
-}
-
-TEST_F(ZtErrHandlerTest, HoldsBackFromHoldOn)
-{
-    ErrorTrap reports;
-
-    PostText("one\n");
-    reports.Hold();
-    PostText("two\n");
-
-    EXPECT_EQ(reports.held, 1);
-    EXPECT_EQ(reports.Text(), "one\n");
-    reports.Release();
-    EXPECT_EQ(reports.Text(), "one\ntwo\n");
-}
-
-TEST_F(ZtErrHandlerTest, HandlesAtOnceWhatArrivesDuringARelease)
-{
-    class Echoing : public ErrorTrap
-    {
-    public:
-        void Handle(ZtErr* error) override
-        {
-            const bool first = reports.empty();
-            ErrorTrap::Handle(error);
-            if (first)
-                PostText("echo ");
-        }
-    };
-    Echoing handler;
-    handler.Hold();
-    PostText("one ");
-    PostText("two ");
-
-    handler.Release();
-
-    EXPECT_EQ(handler.Text(), "one echo two ");
-}
-
-TEST_F(ZtErrHandlerTest, ReleaseWithoutHeldErrorsDoesNothing)
-{
-    ErrorTrap reports;
-
-    reports.Hold();
-    reports.Release();
-    reports.Release();
-
-    EXPECT_EQ(reports.held, 0);
-    EXPECT_EQ(reports.Text(), "");
-}
-
-TEST_F(ZtErrHandlerTest, DeliverToAnyHandlerWorksWithoutTheStack)
-{
-    ErrorTrap below, top;
-
-    below.Deliver(new ZtErr("straight\n", 0, 1));
-    below.Deliver(nullptr);
-
-    EXPECT_EQ(below.Text(), "straight\n");
-    EXPECT_EQ(top.Text(), "");
-}
-
-TEST_F(ZtErrHandlerTest, PopTakesTheOldestAndPopTailTheNewest)
-{
-    ErrorTrap reports;
-    reports.Hold();
-    PostText("one");
-    PostText("two");
-    PostText("three");
-
-    std::unique_ptr<ZtErr> oldest(reports.Pop());
-    std::unique_ptr<ZtErr> newest(reports.PopTail());
-    reports.Release();
-
-    EXPECT_STREQ(oldest->Message(), "one");
-    EXPECT_STREQ(newest->Message(), "three");
-    EXPECT_EQ(reports.Text(), "two");
-    EXPECT_EQ(reports.Pop(), nullptr);
-    EXPECT_EQ(reports.PopTail(), nullptr);
-}
-
-TEST_F(ZtErrHandlerTest, ReleasesBeforeItGoes)
-{
-    ErrorTrap below;
-    {
-        ZtErrHandler holding(1);
-        PostText("one ");
-        PostText("two ");
-    }
-
-    EXPECT_EQ(below.Text(), "one two ");
-}
-
-TEST_F(ZtErrHandlerTest, DestroyedOutOfOrderIsReportedAndAborts)
-{
-    auto* one = new ZtErrHandler;
-    auto* two = new ZtErrHandler;
-
-    EXPECT_EXIT(delete one, aborted, "^Error: handler stack confused\n$");
-
-    delete two;
-    delete one;
-}
-
-TEST_F(ZtErrHandlerTest, AbortReleasesEveryHandlerTheTopFirst)
-{
-    const auto build_and_abort = [] {
-        auto* bottom = new Teller("bottom", 1);
-        PostText("one\n");
-        new Teller("top", 1);
-        PostText("two\n");
-        ASSERT_EQ(bottom->queue.count, 1);
-        ZtErrHandler::Abort();
-    };
-
-    EXPECT_EXIT(build_and_abort(), aborted,
-                "^top: bottom: one\nbottom: two\n$");
-}
-
-TEST_F(ZtErrHandlerTest, PrintsFromTheOutputLevelUp)
-{
-    EXPECT_EQ(Printed([] { PostText("2", 2); }), "");
-    EXPECT_EQ(Printed([] { PostText("3", 3); }), "3");
-    EXPECT_EQ(Printed([] { PostText("4", 4); }), "4");
-    ZtErrHandler::outputLevel = 4;
-    EXPECT_EQ(Printed([] { PostText("3", 3); }), "");
-    EXPECT_EQ(Printed([] { PostText("4", 4); }), "4");
-    ZtErrHandler::outputLevel = 0;
-    EXPECT_EQ(Printed([] { PostText("0", 0); }), "0");
-    EXPECT_EQ(Printed([] { PostText("-1", -1); }), "");
-}
-
-TEST_F(ZtErrHandlerTest, AbortsFromTheAbortLevelUp)
-{
-    ZtErrHandler::abortLevel = 3;
-
-    EXPECT_EQ(Printed([] { PostText("2", 2); }), "");
-    EXPECT_EXIT(PostText("Warning: 3\n", 3), aborted, "^Warning: 3\n$");
-    EXPECT_EXIT(PostText("Error: 4\n", 4), aborted, "^Error: 4\n$");
-}
-
-TEST_F(ZtErrHandlerTest, AbortsSilentlyBelowTheOutputLevel)
-{
-    ZtErrHandler::abortLevel = 1;
-
-    EXPECT_EXIT(ZtDebug("lost\n"), aborted, "^$");
-}
-
-TEST_F(ZtErrHandlerTest, AHandlerOnTopDecidesWhetherAFatalErrorAborts)
-{
-    ErrorTrap reports;
-
-    ZtErr::Check(0, "no way on", 5);
-
-    EXPECT_EQ(reports.Text(), "Error: no way on\n");
-}
-
-TEST_F(ZtErrHandlerTest, ReleasesWhatIsHeldBeforeAFatalErrorEndsAll)
-{
-    const auto build_and_fail = [] {
-        auto* holding = new ZtErrHandler(1);
-        PostText("one\n");
-        holding->next->Deliver(new ZtErr("fatal\n", 0, 5));
-    };
-
-    EXPECT_EXIT(build_and_fail(), aborted, "^fatal\none\n$");
-}
-
-TEST_F(ZtErrHandlerTest, PrintsToStandardErrorWhateverTheOutputStream)
-{
-    std::ostringstream elsewhere;
-    ZtErrHandler::SetOutputStream(&elsewhere);
-
-    EXPECT_EQ(Printed([] { PostText("Error: lost\n"); }), "Error: lost\n");
-
-    EXPECT_EQ(elsewhere.str(), "");
-    EXPECT_EQ(ZtErrHandler::output, &elsewhere);
-}
-
-TEST_F(ZtErrHandlerTest, SetOutputStreamToNullIsStandardError)
-{
-    std::ostringstream elsewhere;
-
-    EXPECT_EQ(ZtErrHandler::output, &std::cerr);
-    ZtErrHandler::SetOutputStream(&elsewhere);
-    EXPECT_EQ(ZtErrHandler::output, &elsewhere);
-    ZtErrHandler::SetOutputStream(nullptr);
-    EXPECT_EQ(ZtErrHandler::output, &std::cerr);
-}
-
-TEST_F(ZtErrHandlerTest, SetsANullOutputStreamToStandardError)
-{
-    for (int level : {1, 4}) { // dropped, and printed
-        ZtErrHandler::output = nullptr;
-
-        Printed([&] { PostText("text\n", level); });
-
-        EXPECT_EQ(ZtErrHandler::output, &std::cerr) << level;
-    }
-    ZtErrHandler::output = nullptr;
-    ZtDebug("dropped\n");
-    EXPECT_EQ(ZtErrHandler::output, &std::cerr);
-}
-
-TEST_F(ZtErrHandlerTest, PrintsTextsAsTheyStand)
-{
-    EXPECT_EQ(Printed([] { PostText("%n%s%s\\n"); }), "%n%s%s\\n");
-}
-
-TEST_F(ZtErrHandlerTest, AnswersAsAPlainObject)
-{
-    ZtErrHandler handler;
-
-    EXPECT_STREQ(handler.ClassName(), "KvoObject");
-}
-
-TEST_F(ZtErrHandlerTest, HandleStandsBehindTheOperationsOfObjects)
-{
-    EXPECT_EQ(SlotOf(&ZtErrHandler::Handle), 11);
-}
-
-TEST_F(ZtErrHandlerTest, WithoutMemoryToHoldBackHandlesAtOnce)
-{
-    class Counting : public ZtErrHandler
-    {
-    public:
-        void Handle(ZtErr* error) override
-        {
-            ++seen;
-            delete error;
-        }
-        int seen = 0;
-    };
-    Counting handler;
-    handler.Hold();
-    auto* error = new ZtErr("one", 0, 4);
-    handler.queue.Clear();
-
-    {
-        FailingMemory none;
-        ZtErrHandler::Post(error);
-        EXPECT_EQ(handler.seen + handler.queue.count, 1);
-    }
-    handler.Release();
-
-    EXPECT_EQ(handler.seen, 1);
-}
-
-// --- message functions -----------------------------------------------------
-
-TEST_F(Messages, HaveTheirPrefixKindAndLevel)
-{
-    ErrorTrap trap;
-
-    ZtDebug("x %d\n", 1);
-    ZtInform("x %d\n", 2);
-    ZtWarning("x %d\n", 3);
-    ZtError("x %d\n", 4);
-    ZtStatus("x %d\n", 5);
-
-    ASSERT_EQ(trap.reports.size(), 5u);
-    const char* const texts[] = {"Debug: x 1\n", "Info: x 2\n",
-                                 "Warning: x 3\n", "Error: x 4\n", "x 5\n"};
-    const int codes[] = {0, 0, 0, 0, 5};
-    const int levels[] = {1, 2, 3, 4, 2};
-    for (std::size_t i = 0; i < 5; ++i) {
-        EXPECT_EQ(trap.reports[i].text, texts[i]);
-        EXPECT_EQ(trap.reports[i].code, codes[i]);
-        EXPECT_EQ(trap.reports[i].level, levels[i]);
-    }
-}
-
-TEST_F(Messages, AreDroppedOrPrintedByTheDefaults)
-{
-    EXPECT_EQ(Printed([] {
-                  ZtDebug("a\n");
-                  ZtInform("b\n");
-                  ZtStatus("c\n");
-                  ZtWarning("d\n");
-                  ZtError("e\n");
-              }),
-              "Warning: d\nError: e\n");
-}
-
-TEST_F(Messages, ArePrintedFromALowerOutputLevelUp)
-{
-    ZtErrHandler::outputLevel = 1;
-
-    EXPECT_EQ(Printed([] {
-                  ZtDebug("a\n");
-                  ZtInform("b\n");
-                  ZtStatus("c\n");
-              }),
-              "Debug: a\nInfo: b\nc\n");
-}
-
-TEST_F(Messages, AddNoNewline)
-{
-    ErrorTrap trap;
-
-    ZtWarning("one");
-    ZtStatus("%s", "");
-
-    EXPECT_EQ(trap.Text(), "Warning: one");
-    EXPECT_EQ(trap.reports.size(), 2u);
-}
-
-TEST_F(Messages, TakeTextOfAnyLength)
-{
-    for (const std::size_t length :
-         std::initializer_list<std::size_t>{1023, 1024, 2047, 2048, 70000}) {
-        const std::string text(length, 'x');
-        ErrorTrap trap;
-
-        ZtError("%s\n", text.c_str());
-
-        EXPECT_EQ(trap.Text(), "Error: " + text + "\n");
-    }
-}
-
-TEST_F(Messages, TakeArgumentsThatLookLikeFormatsAsTheyStand)
-{
-    ErrorTrap trap;
-
-    ZtWarning("%s", "%n%s%s\n");
-
-    EXPECT_EQ(trap.Text(), "Warning: %n%s%s\n");
-}
-
-TEST_F(Messages, OfANullFormatHaveOnlyTheirPrefix)
-{
-    ErrorTrap trap;
-    const char* no_format = nullptr;
-
-    std::invoke(ZtWarning, no_format);
-
-    EXPECT_EQ(trap.Text(), "Warning: ");
-}
-
-TEST_F(Messages, KeepTheLastSystemFailureBeforeThem)
-{
-    ErrorTrap trap;
-
-    errno = ENOENT;
-    ZtWarning("%s\n", std::string(5000, 'x').c_str());
-    errno = 0;
-
-    EXPECT_EQ(trap.reports[0].system_error, ENOENT);
-}
-
-TEST_F(Messages, CountWhetherDroppedPrintedOrCaught)
-{
-    const int before = ZtErr::count;
-
-    ZtDebug("dropped\n");
-    Printed([] { ZtWarning("printed\n"); });
-    ErrorTrap trap;
-    ZtDebug("caught\n");
-
-    EXPECT_EQ(ZtErr::count, before + 3);
-    EXPECT_EQ(trap.Text(), "Debug: caught\n");
-}
-
-TEST_F(Messages, BelowTheOutputLevelAreSeenByAHandlerThatHoldsBack)
-{
-    Printed([] { ZtWarning("the default handler is there\n"); });
-    ZtErrHandler* const bottom = ZtErrHandler::handlerStack;
-    ASSERT_NE(bottom, nullptr);
-
-    bottom->Hold();
-    ZtDebug("kept\n");
-
-    EXPECT_EQ(bottom->queue.count, 1);
-    ZtErrHandler::outputLevel = 1;
-    EXPECT_EQ(Printed([&] { bottom->Release(); }), "Debug: kept\n");
-}
-
-TEST_F(Messages, BelowTheOutputLevelAreSeenByAHandlerPutUnderTheDefault)
-{
-    Printed([] { ZtWarning("the default handler is there\n"); });
-    ZtErrHandler* const bottom = ZtErrHandler::handlerStack;
-    ASSERT_NE(bottom, nullptr);
-    std::string seen;
-    {
-        ErrorTrap trap;
-        ZtErrHandler::handlerStack = bottom;
-        trap.next = nullptr;
-        bottom->next = &trap;
-        ZtDebug("caught\n");
-        seen = trap.Text();
-        bottom->next = nullptr;
-        ZtErrHandler::handlerStack = &trap;
-        trap.next = bottom;
-    }
-
-    EXPECT_EQ(seen, "Debug: caught\n");
-}
-
-TEST_F(Messages, WithoutMemoryArePrintedStraightAway)
-{
-    Printed([] { ZtWarning("the default handler is there\n"); });
-    CapturedStderr captured;
-
-    {
-        FailingMemory none;
-        ZtWarning("no memory for %d\n", 5);
-        ZtDebug("dropped\n");
-    }
-
-    EXPECT_EQ(captured.Text(), "Warning: no memory for 5\n");
-}
-
-TEST_F(Messages, SurviveEverySingleAllocationThatFails)
-{
-    const std::string text(3000, 'x');
-    for (long spared = 0; spared < 20; ++spared) {
-        CapturedStderr captured;
-        bool failed = false;
-        {
-            FailingMemory once(spared, 1);
-            ZtWarning("%s\n", text.c_str());
-            failed = FailingMemory::Failed();
-        }
-        if (!failed)
-            return;
-        EXPECT_LE(captured.Text().size(), text.size() + 10);
-    }
-    FAIL() << "a report takes more allocations than it should";
 }

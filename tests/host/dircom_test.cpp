@@ -56,10 +56,10 @@ public:
     std::string story;
 };
 
-class ZtCommonDirectivesTest : public testing::Test
+class ScriptTest : public testing::Test
 {
 protected:
-    ZtCommonDirectivesTest() { dispatcher.Add(recorder); }
+    ScriptTest() { dispatcher.Add(recorder); }
 
     /// Hands every statement of `text` to the dispatcher and gives what is
     /// written to standard error.
@@ -81,13 +81,14 @@ protected:
     TempDir directory;
 };
 
-using ZtCommonDirectivesIncluding = ZtCommonDirectivesTest;
+using CommonDirectives = ScriptTest;
+using Include = ScriptTest;
 
 } // namespace
 
 // --- the table -------------------------------------------------------------
 
-TEST_F(ZtCommonDirectivesTest, RegistersItsFiveCommands)
+TEST_F(CommonDirectives, RegistersItsFiveCommands)
 {
     std::ostringstream out;
 
@@ -97,12 +98,12 @@ TEST_F(ZtCommonDirectivesTest, RegistersItsFiveCommands)
                          "    System\n    Timer\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, KnowsItsCommandsInEitherCase)
+TEST_F(CommonDirectives, KnowsItsCommandsInEitherCase)
 {
     EXPECT_EQ(Told("ECHO a\necho b\nEcho c\n"), "a\nb\nc\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, AnotherSelectorDoesNothing)
+TEST_F(CommonDirectives, AnotherSelectorDoesNothing)
 {
     ErrorTrap reports;
     CapturedStderr captured;
@@ -117,7 +118,7 @@ TEST_F(ZtCommonDirectivesTest, AnotherSelectorDoesNothing)
     EXPECT_EQ(statement.Count(), 1);
 }
 
-TEST_F(ZtCommonDirectivesTest, SelectorsAreTheRowsOfTheTable)
+TEST_F(CommonDirectives, SelectorsAreTheRowsOfTheTable)
 {
     CapturedStderr captured;
     KvoStatement echo("echo"), timer("timer"), change("cd"), shell("system");
@@ -136,27 +137,27 @@ TEST_F(ZtCommonDirectivesTest, SelectorsAreTheRowsOfTheTable)
 
 // --- Echo and Timer --------------------------------------------------------
 
-TEST_F(ZtCommonDirectivesTest, EchoWritesItsWordsWithSingleBlanks)
+TEST_F(CommonDirectives, EchoWritesItsWordsWithSingleBlanks)
 {
     EXPECT_EQ(Told("Echo   a \t  b\n"), "a b\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, EchoWithoutWordsWritesANewline)
+TEST_F(CommonDirectives, EchoWithoutWordsWritesANewline)
 {
     EXPECT_EQ(Told("Echo\n"), "\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, EchoDoesNotRestoreQuotes)
+TEST_F(CommonDirectives, EchoDoesNotRestoreQuotes)
 {
     EXPECT_EQ(Told("Echo \"a  b\" 'c;d' \\;\n"), "a  b c;d ;\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, EchoWritesFormatsAsTheyStand)
+TEST_F(CommonDirectives, EchoWritesFormatsAsTheyStand)
 {
     EXPECT_EQ(Told("Echo %n%s%s\n"), "%n%s%s\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, EchoWritesNothingToStandardOutput)
+TEST_F(CommonDirectives, EchoWritesNothingToStandardOutput)
 {
     testing::internal::CaptureStdout();
 
@@ -165,7 +166,7 @@ TEST_F(ZtCommonDirectivesTest, EchoWritesNothingToStandardOutput)
     EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
 }
 
-TEST_F(ZtCommonDirectivesTest, TimerWritesTheSecondsSinceTheTimerBefore)
+TEST_F(CommonDirectives, TimerWritesTheSecondsSinceTheTimerBefore)
 {
     clock.AdvanceMicroseconds(2500000);
     const std::string since_the_start = Told("Timer\n");
@@ -176,14 +177,14 @@ TEST_F(ZtCommonDirectivesTest, TimerWritesTheSecondsSinceTheTimerBefore)
     EXPECT_EQ(since_then, "frame 12 0.1\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, TimerWritesSixSignificantDigits)
+TEST_F(CommonDirectives, TimerWritesSixSignificantDigits)
 {
     clock.AdvanceMicroseconds(123456789012);
 
     EXPECT_EQ(Told("Timer\n"), " 123457\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, TimerWritesAPointInEveryLocale)
+TEST_F(CommonDirectives, TimerWritesAPointInEveryLocale)
 {
     OtherLocale german("de_DE");
     clock.AdvanceMicroseconds(2500000);
@@ -191,7 +192,7 @@ TEST_F(ZtCommonDirectivesTest, TimerWritesAPointInEveryLocale)
     EXPECT_EQ(Told("Timer\n"), " 2.5\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, TimerReadsNegativeWhenTheClockIsSetBack)
+TEST_F(CommonDirectives, TimerReadsNegativeWhenTheClockIsSetBack)
 {
     clock.AdvanceMicroseconds(-1500000);
 
@@ -200,21 +201,21 @@ TEST_F(ZtCommonDirectivesTest, TimerReadsNegativeWhenTheClockIsSetBack)
 
 // --- cd and System ---------------------------------------------------------
 
-TEST_F(ZtCommonDirectivesTest, CdChangesToItsFirstWord)
+TEST_F(CommonDirectives, CdChangesToItsFirstWord)
 {
     EXPECT_EQ(Told("cd /tmp /usr\n"), "");
 
     EXPECT_EQ(processes.directories, (std::vector<std::string>{"/tmp"}));
 }
 
-TEST_F(ZtCommonDirectivesTest, CdWithoutAWordChangesNothing)
+TEST_F(CommonDirectives, CdWithoutAWordChangesNothing)
 {
     Told("cd\n");
 
     EXPECT_TRUE(processes.directories.empty());
 }
 
-TEST_F(ZtCommonDirectivesTest, FailuresOfCdAndSystemAreSilent)
+TEST_F(CommonDirectives, FailuresOfCdAndSystemAreSilent)
 {
     ErrorTrap reports;
     processes.result = -1;
@@ -227,21 +228,21 @@ TEST_F(ZtCommonDirectivesTest, FailuresOfCdAndSystemAreSilent)
     EXPECT_EQ(reports.Text(), "");
 }
 
-TEST_F(ZtCommonDirectivesTest, SystemGivesItsWordsAndANewlineToTheShell)
+TEST_F(CommonDirectives, SystemGivesItsWordsAndANewlineToTheShell)
 {
     Told("system   ls \t -l\n");
 
     EXPECT_EQ(processes.commands, (std::vector<std::string>{"ls -l\n"}));
 }
 
-TEST_F(ZtCommonDirectivesTest, SystemWithoutWordsGivesALoneNewline)
+TEST_F(CommonDirectives, SystemWithoutWordsGivesALoneNewline)
 {
     Told("System\n");
 
     EXPECT_EQ(processes.commands, (std::vector<std::string>{"\n"}));
 }
 
-TEST_F(ZtCommonDirectivesTest, SystemDoesNotRestoreQuotes)
+TEST_F(CommonDirectives, SystemDoesNotRestoreQuotes)
 {
     Told("System echo \"a;b\" $(id)\n");
 
@@ -249,7 +250,7 @@ TEST_F(ZtCommonDirectivesTest, SystemDoesNotRestoreQuotes)
               (std::vector<std::string>{"echo a;b $(id)\n"}));
 }
 
-TEST_F(ZtCommonDirectivesTest, SystemRunsTheShell)
+TEST_F(CommonDirectives, SystemRunsTheShell)
 {
     zt_platform::Processes::install(nullptr);
     const std::string told = Told("System echo shown >&2\n");
@@ -258,7 +259,7 @@ TEST_F(ZtCommonDirectivesTest, SystemRunsTheShell)
     EXPECT_EQ(told, "shown\n");
 }
 
-TEST_F(ZtCommonDirectivesTest, SystemCanBeCalledByAHost)
+TEST_F(CommonDirectives, SystemCanBeCalledByAHost)
 {
     KvoStatement statement("system");
     statement.AddArg("ls");
@@ -270,7 +271,7 @@ TEST_F(ZtCommonDirectivesTest, SystemCanBeCalledByAHost)
     EXPECT_EQ(statement.Count(), 1);
 }
 
-TEST_F(ZtCommonDirectivesTest, SystemWithoutMemoryRunsNothing)
+TEST_F(CommonDirectives, SystemWithoutMemoryRunsNothing)
 {
     KvoStatement statement("system");
     statement.AddArg(std::string(5000, 'x').c_str());
@@ -285,7 +286,7 @@ TEST_F(ZtCommonDirectivesTest, SystemWithoutMemoryRunsNothing)
 
 // --- Include ---------------------------------------------------------------
 
-TEST_F(ZtCommonDirectivesIncluding, ReadsTheStatementsOfAFile)
+TEST_F(Include, ReadsTheStatementsOfAFile)
 {
     const std::string script =
         directory.Write("script", "note a\n# not this\n\nnote b; note c\n");
@@ -295,7 +296,7 @@ TEST_F(ZtCommonDirectivesIncluding, ReadsTheStatementsOfAFile)
     EXPECT_EQ(recorder->story, "note a|note b|note c|note d|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, RunsAnInnerScriptToItsEndFirst)
+TEST_F(Include, RunsAnInnerScriptToItsEndFirst)
 {
     const std::string inner = directory.Write("inner", "note b\nnote c\n");
     const std::string outer =
@@ -306,21 +307,21 @@ TEST_F(ZtCommonDirectivesIncluding, RunsAnInnerScriptToItsEndFirst)
     EXPECT_EQ(recorder->story, "note a|note b|note c|note d|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, ALastLineWithoutNewlineIsNotCarriedOut)
+TEST_F(Include, ALastLineWithoutNewlineIsNotCarriedOut)
 {
     const std::string script = directory.Write("script", "Echo a\nEcho x");
 
     EXPECT_EQ(Told("Include " + script + "\n"), "a\n");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, ALastLineEndedByASemicolonIsCarriedOut)
+TEST_F(Include, ALastLineEndedByASemicolonIsCarriedOut)
 {
     const std::string script = directory.Write("script", "Echo a\nEcho x;");
 
     EXPECT_EQ(Told("Include " + script + "\n"), "a\nx\n");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, AMissingScriptIsToldAndTheOuterGoesOn)
+TEST_F(Include, AMissingScriptIsToldAndTheOuterGoesOn)
 {
     ErrorTrap reports;
     const std::string script =
@@ -331,7 +332,7 @@ TEST_F(ZtCommonDirectivesIncluding, AMissingScriptIsToldAndTheOuterGoesOn)
     EXPECT_EQ(reports.Text(), "");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, AFilesNameIsToldAsItStands)
+TEST_F(Include, AFilesNameIsToldAsItStands)
 {
     EXPECT_EQ(Told("Include '%n%s a'\n"),
               "Error - ZtDispatcher: Cannot open file %n%s a\n");
@@ -339,7 +340,7 @@ TEST_F(ZtCommonDirectivesIncluding, AFilesNameIsToldAsItStands)
               "Error - ZtDispatcher: Cannot open file \n");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, AMinusIsStandardInput)
+TEST_F(Include, AMinusIsStandardInput)
 {
     StandardInput input("note a\nnote b\nnote never");
 
@@ -349,7 +350,7 @@ TEST_F(ZtCommonDirectivesIncluding, AMinusIsStandardInput)
     EXPECT_TRUE(std::cin.eof());
 }
 
-TEST_F(ZtCommonDirectivesIncluding, NoNameIsStandardInputToo)
+TEST_F(Include, NoNameIsStandardInputToo)
 {
     StandardInput input("note a\n");
 
@@ -358,7 +359,7 @@ TEST_F(ZtCommonDirectivesIncluding, NoNameIsStandardInputToo)
     EXPECT_EQ(recorder->story, "note a|note b|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, StandardInputAtItsEndGivesNothing)
+TEST_F(Include, StandardInputAtItsEndGivesNothing)
 {
     StandardInput input("");
 
@@ -367,7 +368,7 @@ TEST_F(ZtCommonDirectivesIncluding, StandardInputAtItsEndGivesNothing)
     EXPECT_EQ(recorder->story, "note b|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, StandardInputIsReadOnByAnInnerInclude)
+TEST_F(Include, StandardInputIsReadOnByAnInnerInclude)
 {
     StandardInput input("note a\nInclude -\nnote b\nnote c\n");
 
@@ -376,7 +377,7 @@ TEST_F(ZtCommonDirectivesIncluding, StandardInputIsReadOnByAnInnerInclude)
     EXPECT_EQ(recorder->story, "note a|note b|note c|note d|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, AScriptThatIncludesItselfEndsAtTheFileLimit)
+TEST_F(Include, AScriptThatIncludesItselfEndsAtTheFileLimit)
 {
     rlimit before = {};
     getrlimit(RLIMIT_NOFILE, &before);
@@ -400,14 +401,14 @@ TEST_F(ZtCommonDirectivesIncluding, AScriptThatIncludesItselfEndsAtTheFileLimit)
                   depth * std::string("note up|").size());
 }
 
-TEST_F(ZtCommonDirectivesIncluding, ADirectoryIsAnEmptyScript)
+TEST_F(Include, ADirectoryIsAnEmptyScript)
 {
     EXPECT_EQ(Told("Include " + directory.Path("") + "\nnote a\n"), "");
 
     EXPECT_EQ(recorder->story, "note a|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, APipeWithANameIsAScriptLikeOthers)
+TEST_F(Include, APipeWithANameIsAScriptLikeOthers)
 {
     const std::string pipe = directory.Path("pipe");
     ASSERT_EQ(mkfifo(pipe.c_str(), 0600), 0);
@@ -418,7 +419,7 @@ TEST_F(ZtCommonDirectivesIncluding, APipeWithANameIsAScriptLikeOthers)
     EXPECT_EQ(recorder->story, "note a|note b|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, AnUnknownCommandDoesNotEndTheScript)
+TEST_F(Include, AnUnknownCommandDoesNotEndTheScript)
 {
     ErrorTrap reports;
     const std::string script =
@@ -430,7 +431,7 @@ TEST_F(ZtCommonDirectivesIncluding, AnUnknownCommandDoesNotEndTheScript)
     EXPECT_EQ(recorder->story, "note a|");
 }
 
-TEST_F(ZtCommonDirectivesIncluding, WithoutMemoryTheScriptCannotBeOpened)
+TEST_F(Include, WithoutMemoryTheScriptCannotBeOpened)
 {
     const std::string script = directory.Write("script", "note a\n");
     CapturedStderr captured;
