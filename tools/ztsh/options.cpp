@@ -1,0 +1,81 @@
+#include "options.h"
+
+#include "exit_code.h"
+
+#include <iostream>
+#include <thread>
+
+#include <CLI/CLI.hpp>
+
+namespace ztsh {
+
+namespace {
+
+constexpr int most_includes_allowed = 10000;
+constexpr int most_jobs_allowed = 256;
+
+constexpr const char* footer =
+    "Without scripts and -c, statements come from standard input: from a\n"
+    "prompt if that is a terminal. -c is run before the scripts. The word "
+    "Help\n"
+    "lists the words of the language.\n"
+    "\n"
+    "Exit codes:\n"
+    "  0      all well\n"
+    "  1      a warning or an error was reported\n"
+    "  2      the command line is wrong\n"
+    "  3      a script could not be read\n"
+    "  4      a file or standard output could not be written\n"
+    "  128+n  ended by signal n\n"
+    "The highest that applies; Quit CODE gives its own.";
+
+int cores()
+{
+    return std::clamp<int>(
+        static_cast<int>(std::thread::hardware_concurrency()), 1,
+        most_jobs_allowed);
+}
+
+} // namespace
+
+Options ReadOptions(int argc, const char* const* argv)
+{
+    Options options;
+    options.settings.jobs = cores();
+    CLI::App app("Runs scripts of the command language on pictures.", "ztsh");
+    app.footer(footer);
+    app.set_version_flag("--version", "ztsh " ZTSH_VERSION);
+    app.add_option("script", options.scripts,
+                   "Scripts to run, in order; - is standard input");
+    app.add_option("-c,--command", options.texts,
+                   "Statements to run; may be given several times")
+        ->type_name("STATEMENTS")
+        ->expected(1)
+        ->take_all();
+    app.add_flag("--safe", options.settings.safe,
+                 "No System, no cd, and Include only of relative paths below "
+                 "the script's directory");
+    app.add_option("--max-depth", options.settings.most_includes,
+                   "How many scripts may include each other at a time")
+        ->type_name("N")
+        ->check(CLI::Range(1, most_includes_allowed))
+        ->capture_default_str();
+    app.add_option("--jobs", options.settings.jobs,
+                   "Worker processes of a sequence; 1 runs it in the shell")
+        ->type_name("N")
+        ->check(CLI::Range(1, most_jobs_allowed))
+        ->default_str("the cores");
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::Success& done) {
+        options.finished = true;
+        options.code = app.exit(done, std::cout, std::cerr);
+    } catch (const CLI::ParseError& fault) {
+        std::cerr << "ztsh: " << fault.what() << "; see ztsh --help\n";
+        options.finished = true;
+        options.code = ExitUsage;
+    }
+    return options;
+}
+
+} // namespace ztsh

@@ -1,0 +1,42 @@
+#ifndef ZTSH_SHELL_H
+#define ZTSH_SHELL_H
+
+/// \file
+/// The shell as a whole: a runner with all the words.
+
+#include "options.h"
+#include "pictures/picture_table.h"
+#include "script/runner.h"
+#include "words/common_words.h"
+#include "words/language_words.h"
+#include "words/picture_words.h"
+#include "words/sequence_words.h"
+
+namespace ztsh {
+
+/// A host of the library: it owns the dispatcher, registers the directors,
+/// reads statements and delegates them.
+class Shell
+{
+public:
+    explicit Shell(const Settings& settings);
+
+    /// Runs what the command line asks for.
+    ///
+    /// Returns: the exit code.
+    int Run(const Options& options);
+
+private:
+    void run_prompt();
+
+    Runner runner;
+    PictureTable pictures;
+    CommonWords common;
+    LanguageWords language;
+    PictureWords picture_words;
+    SequenceWords sequences;
+};
+
+} // namespace ztsh
+
+#endif
