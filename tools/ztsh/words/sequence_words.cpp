@@ -156,7 +156,7 @@ int SequenceWords::run_frame(const std::string& frame, const Block& block)
 {
     DirectoryKeeper directory;
     Variables variables = runner.variables;
-    PictureTable table = pictures;
+    PictureTable former_pictures = pictures;
     Outcome outcome = runner.outcome;
     bool was_inside = inside;
 
@@ -169,7 +169,7 @@ int SequenceWords::run_frame(const std::string& frame, const Block& block)
 
     inside = was_inside;
     runner.outcome = outcome;
-    pictures = table;
+    pictures = former_pictures;
     runner.variables = variables;
     return code;
 }
