@@ -50,21 +50,21 @@ Options ReadOptions(int argc, const char* const* argv)
     app.add_option("-c,--command", options.texts,
                    "Statements to run; may be given several times")
         ->type_name("STATEMENTS")
-        ->expected(1)
-        ->take_all();
+        ->option_text("STATEMENTS")
+        ->allow_extra_args(false);
     app.add_flag("--safe", options.settings.safe,
                  "No System, no cd, and Include only of relative paths below "
                  "the script's directory");
     app.add_option("--max-depth", options.settings.most_includes,
-                   "How many scripts may include each other at a time")
-        ->type_name("N")
-        ->check(CLI::Range(1, most_includes_allowed))
-        ->capture_default_str();
+                   "How many scripts may be within each other by Include "
+                   "(default: 200)")
+        ->option_text("N")
+        ->check(CLI::Range(1, most_includes_allowed));
     app.add_option("--jobs", options.settings.jobs,
-                   "Worker processes of a sequence; 1 runs it in the shell")
-        ->type_name("N")
-        ->check(CLI::Range(1, most_jobs_allowed))
-        ->default_str("the cores");
+                   "Worker processes of a sequence; 1 runs it in the shell "
+                   "itself (default: the cores)")
+        ->option_text("N")
+        ->check(CLI::Range(1, most_jobs_allowed));
     try {
         app.parse(argc, argv);
     } catch (const CLI::Success& done) {

@@ -52,9 +52,10 @@ std::string ProgressLine(const Progress& progress, int columns)
     if (room >= least_bar && progress.total > 0) {
         int bar = std::min(room, most_bar);
         int full = static_cast<int>(bar * progress.done / progress.total);
-        line = "[" + std::string(static_cast<std::size_t>(full), '#') +
-               std::string(static_cast<std::size_t>(bar - full), '.') + "] " +
-               line;
+        std::string drawn(static_cast<std::size_t>(bar), '.');
+        drawn.replace(0, static_cast<std::size_t>(full),
+                      static_cast<std::size_t>(full), '#');
+        line.insert(0, "] ").insert(0, drawn).insert(0, "[");
     }
     return line.substr(0, static_cast<std::size_t>(std::max(columns, 0)));
 }
