@@ -55,7 +55,7 @@ std::string ProgressLine(const Progress& progress, int columns)
         std::string drawn(static_cast<std::size_t>(bar), '.');
         drawn.replace(0, static_cast<std::size_t>(full),
                       static_cast<std::size_t>(full), '#');
-        line.insert(0, "] ").insert(0, drawn).insert(0, "[");
+        line.insert(0, "] ").insert(0, drawn).insert(0, 1, '[');
     }
     return line.substr(0, static_cast<std::size_t>(std::max(columns, 0)));
 }

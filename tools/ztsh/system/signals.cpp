@@ -20,10 +20,18 @@ void note_signal(int signal)
     pending_signal = signal;
 }
 
+/// Programs that the shell starts get the default back, which they would not
+/// if the signal were ignored.
+void do_nothing(int) {}
+
 } // namespace
 
 void CatchStopSignals()
 {
+    struct sigaction file_too_large = {};
+    file_too_large.sa_handler = do_nothing;
+    sigemptyset(&file_too_large.sa_mask);
+    sigaction(SIGXFSZ, &file_too_large, nullptr);
     for (int signal : {SIGINT, SIGTERM, SIGHUP}) {
         struct sigaction present = {};
         sigaction(signal, nullptr, &present);

@@ -12,7 +12,8 @@
 namespace ztsh {
 
 /// Starts to catch SIGINT, SIGTERM and SIGHUP, except those that whoever
-/// started the shell has them ignored.
+/// started the shell has them ignored. A file that grows beyond the limit of
+/// the process fails to be written from now on, it does not end the shell.
 void CatchStopSignals();
 
 /// Gives the signal that asks the shell to stop, 0 if there is none.
