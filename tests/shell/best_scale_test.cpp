@@ -6,8 +6,7 @@
 
 using ztsh::ScaleBest;
 
-namespace
-{
+namespace {
 
 int ChannelOf(ZtPixel pixel, int channel)
 {

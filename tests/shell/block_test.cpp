@@ -7,8 +7,7 @@
 
 using namespace ztsh;
 
-namespace
-{
+namespace {
 
 /// The first words of a block's statements.
 std::string WordsOf(const std::vector<StoredStatement>& block)
@@ -71,9 +70,8 @@ TEST(ReadBlock, KeepsTheBlocksInside)
 
 TEST(ReadBlock, KnowsABlockThatItsWordOpens)
 {
-    Outcome outcome =
-        BlockOf("frames 1 2 begin\nb\nend\nFrames 1 2\nbegin\nend\nend\nd\n",
-                true);
+    Outcome outcome = BlockOf(
+        "frames 1 2 begin\nb\nend\nFrames 1 2\nbegin\nend\nend\nd\n", true);
 
     EXPECT_EQ(outcome.words, "frames b end Frames begin end");
     EXPECT_EQ(outcome.rest, "d ");
@@ -132,11 +130,11 @@ TEST(ReadBlock, NotesWhereEachStatementStands)
 TEST(ReadBlock, EndsWhereTheLibrarySkipsTo)
 {
     std::mt19937 random(11);
-    static const char* const words[] = {"a\n", "begin\n", "end\n", "b begin\n",
-                                        "; ",  "END\n",   "begin x; "};
+    static const char* const words[] = {
+        "a\n", "begin\n", "end\n", "b begin\n", "; ", "END\n", "begin x; "};
     for (int i = 0; i < 3000; ++i) {
         std::string script;
-        for (unsigned n = random() % 15; n > 0; --n)
+        for (auto n = random() % 15; n > 0; --n)
             script += words[random() % std::size(words)];
         std::istringstream in(script);
         ZtEatBeginEndBlock(in);

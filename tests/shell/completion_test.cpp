@@ -7,8 +7,7 @@
 
 using namespace ztsh;
 
-namespace
-{
+namespace {
 
 const std::vector<std::string> commands = {"cd", "Echo", "Help", "Resize",
                                            "ResizeBest"};
@@ -95,8 +94,7 @@ TEST(Complete, ArgumentsAreFiles)
     std::filesystem::create_directory(dir.Path("sub"));
     std::string load = "Load a " + dir.Path("");
 
-    EXPECT_EQ(Complete(load + "on", commands).text,
-              dir.Path("one\\ file "));
+    EXPECT_EQ(Complete(load + "on", commands).text, dir.Path("one\\ file "));
     EXPECT_EQ(Complete(load + "s", commands).text, dir.Path("sub/"));
     EXPECT_EQ(Complete(load + "o", commands).candidates,
               (Words{dir.Path("one file"), dir.Path("other")}));
@@ -109,8 +107,7 @@ TEST(Complete, AnOpenQuoteIsClosed)
     TempDir dir;
     dir.Write("one file", "");
 
-    Completion completion =
-        Complete("Load a \"" + dir.Path("one f"), commands);
+    Completion completion = Complete("Load a \"" + dir.Path("one f"), commands);
 
     EXPECT_EQ(completion.text, "\"" + dir.Path("one file") + "\" ");
     EXPECT_EQ(completion.start, 7u);

@@ -9,8 +9,7 @@
 
 using ztsh::FrameRange;
 
-namespace
-{
+namespace {
 
 /// The range that a statement names, and nothing if it names none.
 std::optional<FrameRange> RangeOf(const std::string& words)
@@ -62,11 +61,27 @@ TEST(FrameRange, TakesAWidth)
 
 TEST(FrameRange, RefusesEverythingElse)
 {
-    for (const char* words :
-         {"", "1", "1 x", "x 1", "-1 2", "1 -2", "1 2 0", "1 2 -1", "2 1 1",
-          "1 2 pad", "1 2 pad 0", "1 2 pad 10", "1 2 pad x", "1 2 3 4",
-          "1 2 pad 3 4", "1 2 pad 3 pad 3", "1.5 2", "1 999999999",
-          "1 99999999999999999999", "0x1 2", "1 2 1 padx 3"})
+    for (const char* words : {"",
+                              "1",
+                              "1 x",
+                              "x 1",
+                              "-1 2",
+                              "1 -2",
+                              "1 2 0",
+                              "1 2 -1",
+                              "2 1 1",
+                              "1 2 pad",
+                              "1 2 pad 0",
+                              "1 2 pad 10",
+                              "1 2 pad x",
+                              "1 2 3 4",
+                              "1 2 pad 3 4",
+                              "1 2 pad 3 pad 3",
+                              "1.5 2",
+                              "1 999999999",
+                              "1 99999999999999999999",
+                              "0x1 2",
+                              "1 2 1 padx 3"})
         EXPECT_FALSE(RangeOf(words)) << words;
 }
 

@@ -10,8 +10,7 @@
 using ztsh::HistoryFile;
 using ztsh::HistoryPath;
 
-namespace
-{
+namespace {
 
 using Lines = std::vector<std::string>;
 

@@ -9,8 +9,7 @@
 
 using namespace ztsh;
 
-namespace
-{
+namespace {
 
 ZtImageSGI NoisePicture(int width, int height)
 {

@@ -5,8 +5,7 @@
 using ztsh::Picture;
 using ztsh::PictureTable;
 
-namespace
-{
+namespace {
 
 std::shared_ptr<Picture> PictureOf(ZtPixel pixel)
 {

@@ -12,8 +12,7 @@
 
 using ztsh::WritePng;
 
-namespace
-{
+namespace {
 
 /// A picture of the pixels as they stand in memory, bottom row first.
 ZtImageSGI PictureOf(int width, int height,
@@ -37,8 +36,9 @@ TEST(WritePng, WritesTheTopRowFirstAndRedInTheFirstByte)
     ReadPicture read = ReadPng(dir.Path("a.png"));
     EXPECT_EQ(read.width, 2);
     EXPECT_EQ(read.height, 2);
-    EXPECT_EQ(read.pixels, (std::vector<std::uint32_t>{
-                               0xF0E0D0FF, 0x102030FF, 0x010203FF, 0x040506FF}));
+    EXPECT_EQ(read.pixels,
+              (std::vector<std::uint32_t>{0xF0E0D0FF, 0x102030FF, 0x010203FF,
+                                          0x040506FF}));
 }
 
 TEST(WritePng, LeavesAlphaOutOfAnOpaquePicture)

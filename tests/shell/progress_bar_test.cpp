@@ -38,7 +38,7 @@ TEST(ProgressLine, LeavesTheRateOutBeforeThereIsOne)
 TEST(ProgressLine, FitsIntoANarrowWindow)
 {
     EXPECT_EQ(ProgressLine({1, 4, 0, 1.0}, 30),
-              "[#......] 1/4  1.0/s  0:03 left");
+              "[#.....] 1/4  1.0/s  0:03 left");
     EXPECT_EQ(ProgressLine({1, 4, 0, 1.0}, 12), "1/4  1.0/s  ");
     EXPECT_EQ(ProgressLine({1, 4, 0, 1.0}, 0), "");
 }

@@ -8,8 +8,7 @@
 
 using namespace ztsh;
 
-namespace
-{
+namespace {
 
 /// Gives lines that were written down beforehand, and keeps the prompts.
 class WrittenEditor : public LineEditor
@@ -17,8 +16,7 @@ class WrittenEditor : public LineEditor
 public:
     explicit WrittenEditor(std::deque<std::string> written_lines)
         : lines(std::move(written_lines))
-    {
-    }
+    {}
 
     Typed Ask(const std::string& prompt, std::string& line) override
     {

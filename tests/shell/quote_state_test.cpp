@@ -10,8 +10,7 @@
 
 using ztsh::QuoteState;
 
-namespace
-{
+namespace {
 
 bool OpenAfter(const std::string& text)
 {
@@ -83,7 +82,7 @@ TEST(QuoteState, AgreesWithTheTokenizer)
     const std::string letters = "a \"'\\;\n#!";
     for (int i = 0; i < 5000; ++i) {
         std::string text;
-        for (unsigned length = random() % 20; length > 0; --length)
+        for (auto length = random() % 20; length > 0; --length)
             text += letters[random() % letters.size()];
         QuoteState state;
         state.Add(text + "\n");

@@ -15,14 +15,13 @@ using ztsh::Place;
 using ztsh::Runner;
 using ztsh::Settings;
 
-namespace
-{
+namespace {
 
 /// Keeps every statement that is delegated.
 class Recorder : public ZtDirector
 {
 public:
-    explicit Recorder(ZtDispatcher& dispatcher) : ZtDirector(dispatcher)
+    explicit Recorder(ZtDispatcher& home) : ZtDirector(home)
     {
         AddEach(0);
     }
@@ -41,11 +40,11 @@ public:
 std::string RandomScript(std::mt19937& random)
 {
     static const char* const pieces[] = {
-        "a",  "b c", " ",    "\n",  "\n\n", ";",   "!",  "#", "# x ", "\\",
-        "\"", "'",   "\\\n", "\t",  "\r",   "\\;", "\"q r\"", "'#'", "\x01",
-        "\xE4", "\"\"", "!x\n", "#y\n"};
+        "a",       "b c", " ",    "\n",   "\n\n", ";",    "!",   "#",
+        "# x ",    "\\",  "\"",   "'",    "\\\n", "\t",   "\r",  "\\;",
+        "\"q r\"", "'#'", "\x01", "\xE4", "\"\"", "!x\n", "#y\n"};
     std::string script;
-    for (unsigned i = random() % 30; i > 0; --i)
+    for (auto i = random() % 30; i > 0; --i)
         script += pieces[random() % std::size(pieces)];
     return script;
 }
@@ -59,7 +58,7 @@ TEST(Runner, DelegatesWhatTheLibrarysIncludeDelegates)
     TempDir dir;
     std::mt19937 random(20);
     CapturedStderr silence;
-    for (int i = 0; i < 4000; ++i) {
+    for (int i = 0; i < 1500; ++i) {
         std::string script = RandomScript(random);
         std::string name = dir.Write("script", script);
         ZtDispatcher dispatcher;
@@ -170,7 +169,7 @@ TEST(ReportHandler, TellsThePlaceOfReportsThatAreOnlyInformation)
     class Informer : public ZtDirector
     {
     public:
-        explicit Informer(ZtDispatcher& dispatcher) : ZtDirector(dispatcher)
+        explicit Informer(ZtDispatcher& home) : ZtDirector(home)
         {
             AddDirective(0, "x");
         }

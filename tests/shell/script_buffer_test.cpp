@@ -9,8 +9,7 @@
 
 using ztsh::ScriptBuffer;
 
-namespace
-{
+namespace {
 
 /// A file that is open for reading.
 class OpenFile
@@ -18,8 +17,7 @@ class OpenFile
 public:
     explicit OpenFile(const std::string& bytes)
         : descriptor(open(dir.Write("script", bytes).c_str(), O_RDONLY))
-    {
-    }
+    {}
     ~OpenFile() { close(descriptor); }
 
     TempDir dir;

@@ -8,8 +8,7 @@ using ztsh::FitIntoCells;
 using ztsh::PictureSize;
 using ztsh::WriteHalfBlocks;
 
-namespace
-{
+namespace {
 
 void ExpectFit(PictureSize picture, int columns, int rows, int width,
                int height)

@@ -4,8 +4,7 @@
 
 using ztsh::Variables;
 
-namespace
-{
+namespace {
 
 std::string Expanded(const std::string& text)
 {
@@ -53,7 +52,8 @@ TEST(Variables, ANameThatIsNotSetStaysAndIsTold)
 
 TEST(Variables, ADollarWithoutNameIsACharacter)
 {
-    EXPECT_EQ(Expanded("$ $1 $$a ${ ${} ${1} ${a"), "$ $1 $one ${ ${} ${1} ${a");
+    EXPECT_EQ(Expanded("$ $1 $$a ${ ${} ${1} ${a"),
+              "$ $1 $one ${ ${} ${1} ${a");
     EXPECT_EQ(Expanded("$"), "$");
     EXPECT_EQ(Expanded(""), "");
 }

@@ -9,8 +9,7 @@
 
 using namespace ztsh;
 
-namespace
-{
+namespace {
 
 const std::vector<Word> words = {
     {"Move", "NAME [PLACE]", "Moves a thing.\nOr not.", 1, 2},
@@ -20,7 +19,7 @@ const std::vector<Word> words = {
 class Mover : public WordDirector
 {
 public:
-    explicit Mover(ZtDispatcher& dispatcher) : WordDirector(dispatcher, words)
+    explicit Mover(ZtDispatcher& home) : WordDirector(home, words)
     {
         AddEach(each_selector);
     }

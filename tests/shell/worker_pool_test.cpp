@@ -16,8 +16,7 @@
 using ztsh::JobResult;
 using ztsh::WorkerPool;
 
-namespace
-{
+namespace {
 
 std::vector<JobResult> ResultsOf(int workers, long count,
                                  const WorkerPool::Job& job)

@@ -11,7 +11,8 @@ namespace ztsh {
 
 namespace {
 
-constexpr int most_includes_allowed = 10000;
+/// As many as the stack surely has room for.
+constexpr int most_includes_allowed = 1000;
 constexpr int most_jobs_allowed = 256;
 
 constexpr const char* footer =

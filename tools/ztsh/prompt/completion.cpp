@@ -145,7 +145,7 @@ std::string InColumns(const std::vector<std::string>& words, int columns)
     for (const std::string& word : words)
         widest = std::max(widest, word.size());
     std::size_t room = static_cast<std::size_t>(std::max(columns, 1));
-    std::size_t across = std::max<std::size_t>(1, (room + 1) / (widest + 2));
+    std::size_t across = std::max<std::size_t>(1, (room + 2) / (widest + 2));
     std::size_t down = (words.size() + across - 1) / across;
     std::string text;
     for (std::size_t row = 0; row < down; ++row) {

@@ -183,7 +183,7 @@ unsigned char TerminalEditor::complete(EditLine* editor, int)
         el_insertstr(editor, found.text.c_str());
         return CC_REFRESH;
     }
-    int columns = SizeOfWindow(STDOUT_FILENO).columns;
+    int columns = SizeOfWindow(STDOUT_FILENO).columns - 1;
     std::printf("\n%s", InColumns(found.candidates, columns).c_str());
     std::fflush(stdout);
     return CC_REDISPLAY;

@@ -17,6 +17,7 @@ namespace {
 constexpr const char* frame_variable = "frame";
 constexpr int errors_descriptor = 2;
 constexpr int most_words = 7;
+constexpr int most_depth = 100;
 
 enum Selector : int { Frames, Begin };
 
@@ -88,7 +89,11 @@ void SequenceWords::frames(KvoStatement& statement)
     BlockRead read = ReadBlock(*runner.Source(), opened, block);
     if (read == BlockRead::NoEnd)
         ZtError("Frames: expected end, nothing was run\n");
-    if (read == BlockRead::Whole && right)
+    if (read == BlockRead::Whole && right && depth >= most_depth)
+        ZtError("Frames: more than %d sequences within each other, this one "
+                "is not run\n",
+                most_depth);
+    else if (read == BlockRead::Whole && right)
         run(range, block);
     if (read == BlockRead::NoBegin) {
         ZtError("Frames: expected begin, nothing was run\n");
@@ -106,14 +111,14 @@ void SequenceWords::skip_block()
 
 void SequenceWords::run(const FrameRange& range, const Block& block)
 {
-    bool show = !inside && IsTerminal(errors_descriptor);
+    bool show = depth == 0 && IsTerminal(errors_descriptor);
     Tally tally(range.Count(), show);
-    if (runner.settings.jobs > 1 && tally.count > 1 && !inside)
+    if (runner.settings.jobs > 1 && tally.count > 1 && depth == 0)
         run_in_workers(range, block, tally);
     else
         run_here(range, block, tally);
     tally.bar.Hide();
-    if (StopSignal() != 0 && !inside)
+    if (StopSignal() != 0 && depth == 0)
         std::cerr << "Frames: stopped after " << tally.done << " of "
                   << tally.count << " frames\n";
     if (tally.failed > 0)
@@ -158,16 +163,15 @@ int SequenceWords::run_frame(const std::string& frame, const Block& block)
     Variables variables = runner.variables;
     PictureTable former_pictures = pictures;
     Outcome outcome = runner.outcome;
-    bool was_inside = inside;
 
-    inside = true;
+    ++depth;
     runner.outcome = Outcome();
     runner.variables.Set(frame_variable, frame);
     BlockSource source(block);
     runner.Run(source);
     int code = runner.outcome.Code();
 
-    inside = was_inside;
+    --depth;
     runner.outcome = outcome;
     pictures = former_pictures;
     runner.variables = variables;

@@ -46,7 +46,7 @@ private:
 
     Runner& runner;
     PictureTable& pictures;
-    bool inside = false; ///< A frame runs.
+    int depth = 0; ///< Sequences whose frames run, within each other.
 };
 
 } // namespace ztsh

@@ -1,0 +1,194 @@
+"""The prompt in a pseudo-terminal.
+
+Usage: prompt_test.py SHELL TREE
+"""
+
+import os
+import pathlib
+import stat
+import sys
+import tempfile
+import unittest
+
+from terminal import Terminal
+
+SHELL = os.path.abspath(sys.argv[1])
+
+
+class Prompt(unittest.TestCase):
+    def setUp(self):
+        self.holder = tempfile.TemporaryDirectory(prefix="zt_prompt_")
+        self.directory = pathlib.Path(self.holder.name).resolve()
+        self.addCleanup(self.holder.cleanup)
+
+    def start(self, *arguments, rows=24, columns=80):
+        environment = {"XDG_STATE_HOME": str(self.directory / "state"),
+                       "HOME": str(self.directory), "TERM": "xterm",
+                       "LC_ALL": "C.UTF-8"}
+        return Terminal([SHELL, *arguments], self.directory, environment, rows,
+                        columns)
+
+    def test_statements_run_one_by_one(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo a'b'c; Echo d\r")
+        terminal.wait_for("\nabc\r\n")
+        terminal.wait_for("d\r\n")
+        terminal.wait_for("ztsh> ")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
+
+    def test_reports_name_no_line_and_count(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("Nosuch\r")
+        terminal.wait_for("Unknown command: Nosuch\r\n")
+        terminal.wait_for("ztsh> ")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 1)
+        self.assertNotIn(" at ", terminal.seen)
+
+    def test_an_open_quote_asks_on(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo 'one\r")
+        terminal.wait_for("....> ")
+        terminal.type("two'\r")
+        terminal.wait_for("\none\r\ntwo\r\n")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo one \\\r")
+        terminal.wait_for("....> ")
+        terminal.type(" two\r")
+        terminal.wait_for("\none two\r\n")
+        terminal.type("Quit 5\r")
+        self.assertEqual(terminal.end(), 5)
+
+    def test_a_block_asks_on(self):
+        terminal = self.start("--jobs", "1")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Frames 1 2 begin\r")
+        terminal.wait_for("....> ")
+        terminal.type("Echo frame$frame\r")
+        terminal.wait_for("....> ")
+        terminal.type("end\r")
+        terminal.wait_for("frame0001\r\n")
+        terminal.wait_for("frame0002\r\n")
+        terminal.wait_for("ztsh> ")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
+
+    def test_interrupt_takes_back_the_line_only(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo no")
+        terminal.wait_for("no")
+        terminal.type("\x03")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo 'open\r")
+        terminal.wait_for("....> ")
+        terminal.type("\x03")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo still$here\r")
+        terminal.wait_for("\nstill" + str(self.directory))
+        terminal.wait_for("ztsh> ")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
+        self.assertNotIn("\nno", terminal.seen)
+
+    def test_interrupt_takes_back_a_block(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("Frames 1 2 begin\r")
+        terminal.wait_for("....> ")
+        terminal.type("\x03")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo on\r")
+        terminal.wait_for("\non\r\n")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
+
+    def test_interrupt_ends_the_statement_that_runs(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("System echo started; sleep 100\r".replace(";", "\\;"))
+        terminal.wait_for("\nstarted")
+        terminal.type("\x03")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo on\r")
+        terminal.wait_for("\non\r\n")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
+
+    def test_history_is_kept_for_its_owner(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo first\r")
+        terminal.wait_for("\nfirst")
+        terminal.wait_for("ztsh> ")
+        terminal.type("\x04")
+        terminal.end()
+        history = self.directory / "state/ztsh/history"
+        self.assertEqual(history.read_text(), "Echo first\n")
+        self.assertEqual(stat.S_IMODE(history.stat().st_mode), 0o600)
+        self.assertEqual(stat.S_IMODE(history.parent.stat().st_mode), 0o700)
+
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("\x1b[A")
+        terminal.wait_for("Echo first")
+        terminal.type(" again\r")
+        terminal.wait_for("\nfirst again\r\n")
+        terminal.type("\x04")
+        terminal.end()
+        self.assertEqual(history.read_text(), "Echo first\nEcho first again\n")
+
+    def test_lines_are_edited(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("cho a\u00e9\x01E\r")
+        terminal.wait_for("\na\u00e9\r\n")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
+
+    def test_tab_completes_words_and_files(self):
+        (self.directory / "only one").write_text("")
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("ec\tx o\t\r")
+        terminal.wait_for("\nx only one\r\n")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Resi\t")
+        terminal.wait_for("ze")  # only what is new is drawn
+        terminal.type("\t")
+        terminal.wait_for("Resize  ResizeBest\r\n")
+        terminal.wait_for("ztsh> Resize")
+        terminal.type("\x15Quit 6\r")
+        self.assertEqual(terminal.end(), 6)
+
+    def test_show_fills_the_window(self):
+        header = bytes.fromhex("01da0001000300040002000300000000000000ff")
+        (self.directory / "a.rgb").write_bytes(
+            header.ljust(512, b"\0") + bytes(8) + b"\x40" * 8 + b"\x80" * 8)
+        terminal = self.start(rows=6, columns=20)
+        terminal.wait_for("ztsh> ")
+        terminal.type("Load a a.rgb; Show a\r")
+        terminal.wait_for("\x1b[38;2;0;64;128m\x1b[48;2;0;64;128m" +
+                          "\u2580" * 20 + "\x1b[0m\r\n")
+        terminal.wait_for("ztsh> ")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
+        self.assertEqual(terminal.seen.count("\u2580"), 20 * 5)
+
+    def test_a_sequence_shows_how_far_it_is(self):
+        for jobs in ("1", "2"):
+            terminal = self.start("--jobs", jobs, "-c", "Frames 1 3 begin; "
+                                  "System sleep 0.15; Echo done $frame; end")
+            terminal.wait_for("0/3")
+            terminal.wait_for("done 0001\r\n")
+            terminal.wait_for("left\x1b[K")
+            terminal.wait_for("\r\x1b[Kdone 0003\r\n")
+            self.assertEqual(terminal.end(), 0)
+
+
+if __name__ == "__main__":
+    unittest.main(argv=sys.argv[:1])
