@@ -110,7 +110,8 @@ class Prompt(unittest.TestCase):
     def test_interrupt_ends_the_statement_that_runs(self):
         terminal = self.start()
         terminal.wait_for("ztsh> ")
-        terminal.type("System echo started; sleep 100\r".replace(";", "\\;"))
+        terminal.type("System 'trap \"exit 1\" INT; echo started; "
+                      "while :; do sleep 0.05; done'\r")
         terminal.wait_for("\nstarted")
         terminal.type("\x03")
         terminal.wait_for("ztsh> ")
@@ -160,7 +161,7 @@ class Prompt(unittest.TestCase):
         terminal.type("Resi\t")
         terminal.wait_for("ze")  # only what is new is drawn
         terminal.type("\t")
-        terminal.wait_for("Resize  ResizeBest\r\n")
+        terminal.wait_for("Resize      ResizeBest\r\n")
         terminal.wait_for("ztsh> Resize")
         terminal.type("\x15Quit 6\r")
         self.assertEqual(terminal.end(), 6)

@@ -21,10 +21,7 @@ namespace {
 class Recorder : public ZtDirector
 {
 public:
-    explicit Recorder(ZtDispatcher& home) : ZtDirector(home)
-    {
-        AddEach(0);
-    }
+    explicit Recorder(ZtDispatcher& home) : ZtDirector(home) { AddEach(0); }
 
     void Act(KvoStatement* statement, int) override
     {
