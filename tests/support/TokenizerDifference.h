@@ -91,4 +91,32 @@ private:
     std::string difference;
 };
 
+/// Compares the two tokenizers on `text`: tokens and statements, from memory,
+/// in chunks and character by character.
+inline std::string TokenizerDifferenceOn(const std::string& text)
+{
+    using Chunks = StreamOf<ChunkBuffer>;
+    using OneByOne = StreamOf<OneByOneBuffer>;
+    std::string difference;
+    const auto compare = [&](std::istream&& tested, std::istream&& reference,
+                             const char* special) {
+        if (!difference.empty())
+            return;
+        TokenizerDifference both(tested, reference);
+        difference = special ? both.OfTokens(special, 1'000'000)
+                             : both.OfStatements(1'000'000);
+    };
+    for (const char* special : {"/", "!;\n", "abcdef", ""}) {
+        compare(std::istringstream(text), std::istringstream(text), special);
+        compare(Chunks(text, std::size_t{70}), Chunks(text, std::size_t{70}),
+                special);
+    }
+    compare(std::istringstream(text), std::istringstream(text), nullptr);
+    compare(Chunks(text, std::size_t{70}), Chunks(text, std::size_t{70}),
+            nullptr);
+    compare(OneByOne(text, true), OneByOne(text, true), nullptr);
+    compare(OneByOne(text, false), OneByOne(text, false), nullptr);
+    return difference;
+}
+
 #endif
