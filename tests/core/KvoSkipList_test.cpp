@@ -1,0 +1,660 @@
+#include "KvoSkipList_support.h"
+
+#include "support/FakeRandom.h"
+
+#include <memory>
+#include <stdlib.h>
+
+namespace {
+
+/// Objects of 10, 20 and 30 in a list.
+struct Tens
+{
+    Tens()
+    {
+        for (Number* number : {&twenty, &ten, &thirty})
+            list.Insert(number);
+    }
+
+    Number ten{10}, twenty{20}, thirty{30};
+    KvoSkipList list;
+};
+
+/// Gives the object under the cursor, null also for the header.
+KvoObject* UnderCursor(const KvoSkipList& list)
+{
+    return list.current ? list.current->object : nullptr;
+}
+
+const int five = 5, twenty = 20, twenty_five = 25, thirty = 30, forty = 40;
+
+/// The number whose low bits give a node this height.
+long Bits(int height)
+{
+    return (1L << (height + 1)) - 1;
+}
+
+} // namespace
+
+TEST(KvoSkipList, NewOneIsEmpty)
+{
+    KvoSkipList list;
+
+    EXPECT_EQ(ObjectsOf(list), Objects());
+    EXPECT_EQ(list.current, nullptr);
+    EXPECT_EQ(list.levels, 1);
+    EXPECT_EQ(list.header->object, nullptr);
+    EXPECT_EQ(list.header->level, 23);
+    EXPECT_STREQ(list.ClassName(), "KvoObject");
+}
+
+TEST(KvoSkipList, EmptyOneGivesNullForEverything)
+{
+    KvoSkipList list;
+    int key = 1;
+
+    EXPECT_EQ(list.Next(), nullptr);
+    EXPECT_EQ(list.Peek(), nullptr);
+    EXPECT_EQ(list.Head(), nullptr);
+    EXPECT_EQ(list.current, nullptr);
+    EXPECT_EQ(list.Tail(), nullptr);
+    EXPECT_EQ(list.current, list.header);
+    EXPECT_EQ(list.Peek(), nullptr);
+    EXPECT_EQ(list.Next(), nullptr);
+    EXPECT_EQ(list.current, nullptr);
+    EXPECT_EQ(list.Search(&key), nullptr);
+    EXPECT_EQ(list.SearchAlmost(&key), nullptr);
+    EXPECT_EQ(list.RemoveKey(&key), nullptr);
+    EXPECT_EQ(list[&key], nullptr);
+}
+
+TEST(KvoSkipList, InsertKeepsTheOrderOfTheKeys)
+{
+    Tens tens;
+
+    EXPECT_EQ(ObjectsOf(tens.list),
+              (Objects{&tens.ten, &tens.twenty, &tens.thirty}));
+}
+
+TEST(KvoSkipList, InsertLeavesTheCursorOnTheNewNode)
+{
+    Tens tens;
+    Number middle(25);
+
+    tens.list.Insert(&middle);
+
+    EXPECT_EQ(UnderCursor(tens.list), &middle);
+    EXPECT_EQ(tens.list.Next(), &tens.thirty);
+}
+
+TEST(KvoSkipList, ObjectsOfEqualKeysStandOldestFirst)
+{
+    Number a1(1), a2(1), a3(1);
+    KvoSkipList list;
+    for (Number* number : {&a1, &a2, &a3})
+        list.Insert(number);
+
+    EXPECT_EQ(list.Head(), &a1);
+    EXPECT_EQ(list.Next(), &a2);
+    EXPECT_EQ(list.Next(), &a3);
+    EXPECT_EQ(list.Next(), nullptr);
+    EXPECT_EQ(list.RemoveKey(a1.Key()), &a1);
+    EXPECT_EQ(ObjectsOf(list), (Objects{&a2, &a3}));
+}
+
+TEST(KvoSkipList, ObjectsOfEqualKeysStandOldestFirstOnEveryLevel)
+{
+    FakeRandom dice;
+    dice.numbers = {Bits(3), Bits(1), Bits(2), Bits(3), Bits(1), Bits(4)};
+    Number before(0), a1(1), a2(1), a3(1), behind(2), a4(1);
+    KvoSkipList list;
+
+    for (Number* number : {&before, &a1, &a2, &a3, &behind, &a4})
+        list.Insert(number);
+
+    EXPECT_EQ(ObjectsOf(list), (Objects{&before, &a1, &a2, &a3, &a4, &behind}));
+}
+
+TEST(KvoSkipList, InsertTakesNoNull)
+{
+    Tens tens;
+
+    tens.list.Insert(nullptr);
+
+    EXPECT_EQ(tens.list.InsertUnique(nullptr), 0);
+    EXPECT_EQ(tens.list.Remove(nullptr), nullptr);
+    EXPECT_EQ(tens.list.count, 3);
+}
+
+TEST(KvoSkipList, InsertUniqueInsertsANewKey)
+{
+    Tens tens;
+    Number middle(25);
+
+    int inserted = tens.list.InsertUnique(&middle);
+
+    EXPECT_EQ(inserted, 1);
+    EXPECT_EQ(UnderCursor(tens.list), &middle);
+    EXPECT_EQ(ObjectsOf(tens.list),
+              (Objects{&tens.ten, &tens.twenty, &middle, &tens.thirty}));
+}
+
+TEST(KvoSkipList, InsertUniqueRefusesAKeyThatIsThere)
+{
+    Tens tens;
+    Number second(20);
+
+    int inserted = tens.list.InsertUnique(&second);
+
+    EXPECT_EQ(inserted, 0);
+    EXPECT_EQ(tens.list.count, 3);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.ten);
+}
+
+TEST(KvoSkipList, RemoveTakesThisVeryObject)
+{
+    Number a1(1), a2(1), a3(1);
+    KvoSkipList list;
+    for (Number* number : {&a1, &a2, &a3})
+        list.Insert(number);
+
+    KvoObject* removed = list.Remove(&a2);
+
+    EXPECT_EQ(removed, &a2);
+    EXPECT_EQ(UnderCursor(list), &a1);
+    EXPECT_EQ(ObjectsOf(list), (Objects{&a1, &a3}));
+    EXPECT_EQ(Number::alive, 3);
+}
+
+TEST(KvoSkipList, RemoveOfTheFirstLeavesTheCursorOnTheHeader)
+{
+    Tens tens;
+
+    tens.list.Remove(&tens.ten);
+
+    EXPECT_EQ(tens.list.current, tens.list.header);
+    EXPECT_EQ(tens.list.Next(), &tens.twenty);
+}
+
+TEST(KvoSkipList, RemoveOfAnotherObjectOfAnEqualKeyChangesNothing)
+{
+    Tens tens;
+    Number second(20);
+    const std::vector<int> heights = HeightsOf(tens.list);
+
+    KvoObject* removed = tens.list.Remove(&second);
+
+    EXPECT_EQ(removed, nullptr);
+    EXPECT_EQ(ObjectsOf(tens.list),
+              (Objects{&tens.ten, &tens.twenty, &tens.thirty}));
+    EXPECT_EQ(HeightsOf(tens.list), heights);
+}
+
+TEST(KvoSkipList, RemoveOfAnAbsentKeyGivesNull)
+{
+    Tens tens;
+    Number absent(25);
+
+    EXPECT_EQ(tens.list.Remove(&absent), nullptr);
+    EXPECT_EQ(tens.list.count, 3);
+}
+
+TEST(KvoSkipList, RemoveKeyTakesTheOldest)
+{
+    Tens tens;
+    Number second(20);
+    tens.list.Insert(&second);
+
+    KvoObject* removed = tens.list.RemoveKey(&twenty);
+
+    EXPECT_EQ(removed, &tens.twenty);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.ten);
+    EXPECT_EQ(ObjectsOf(tens.list),
+              (Objects{&tens.ten, &second, &tens.thirty}));
+}
+
+TEST(KvoSkipList, RemoveKeyOfAnAbsentKeyGivesNull)
+{
+    Tens tens;
+
+    EXPECT_EQ(tens.list.RemoveKey(&twenty_five), nullptr);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.twenty);
+    EXPECT_EQ(tens.list.count, 3);
+}
+
+TEST(KvoSkipList, SearchFindsOnlyAnEqualKey)
+{
+    Tens tens;
+
+    EXPECT_EQ(tens.list.Search(&twenty), &tens.twenty);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.twenty);
+    EXPECT_EQ(tens.list.Search(&twenty_five), nullptr);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.twenty);
+    EXPECT_EQ(tens.list.Next(), &tens.thirty);
+    EXPECT_EQ(tens.list.Search(&five), nullptr);
+    EXPECT_EQ(tens.list.current, tens.list.header);
+    EXPECT_EQ(tens.list.Peek(), &tens.ten);
+}
+
+TEST(KvoSkipList, SearchFindsTheOldestOfEqualKeys)
+{
+    Tens tens;
+    Number second(20);
+    tens.list.Insert(&second);
+
+    EXPECT_EQ(tens.list.Search(&twenty), &tens.twenty);
+    EXPECT_EQ(tens.list.SearchAlmost(&twenty), &tens.twenty);
+    EXPECT_EQ(tens.list.SearchAlmost(&twenty_five), &second);
+}
+
+TEST(KvoSkipList, SearchAlmostFindsTheLastSmallerKeyInstead)
+{
+    Tens tens;
+
+    EXPECT_EQ(tens.list.SearchAlmost(&twenty), &tens.twenty);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.twenty);
+    EXPECT_EQ(tens.list.SearchAlmost(&twenty_five), &tens.twenty);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.twenty);
+    EXPECT_EQ(tens.list.SearchAlmost(&forty), &tens.thirty);
+    EXPECT_EQ(tens.list.SearchAlmost(&five), nullptr);
+    EXPECT_EQ(tens.list.current, tens.list.header);
+}
+
+TEST(KvoSkipList, SearchesTextKeysOfEveryKind)
+{
+    KvoNamedObject one("one"), two("two");
+    KvoSkipList list;
+    list.Insert(&one);
+    list.Insert(&two);
+    char name[] = "two";
+
+    EXPECT_EQ(list.Search("one"), &one);
+    EXPECT_EQ(list.Search(name), &two);
+    EXPECT_EQ(list.Search(two.Key()), &two);
+    EXPECT_EQ(list["zzz"], &two);
+}
+
+TEST(KvoSkipList, SearchesWhatTheObjectsSayNow)
+{
+    Tens tens;
+
+    tens.twenty.key = 25;
+
+    EXPECT_EQ(tens.list.Search(&twenty), nullptr);
+    EXPECT_EQ(tens.list.Search(&twenty_five), &tens.twenty);
+}
+
+TEST(KvoSkipList, SearchNeverAsksAnObjectTwice)
+{
+    KvoSkipList list;
+    srandom(3);
+    std::vector<std::unique_ptr<Number>> numbers;
+    for (int i = 0; i < 1000; ++i) {
+        numbers.push_back(std::make_unique<Number>(i));
+        list.Insert(numbers.back().get());
+    }
+
+    for (int key = -1; key < 1000; ++key) {
+        for (auto& number : numbers)
+            number->asked = 0;
+        list.Search(&key);
+        for (auto& number : numbers)
+            ASSERT_LE(number->asked, 1) << key;
+    }
+}
+
+TEST(KvoSkipList, IndexingReplacesWithoutSortingAgain)
+{
+    Tens tens;
+    Number other(99);
+
+    tens.list[&twenty_five] = &other;
+
+    EXPECT_EQ(ObjectsOf(tens.list), (Objects{&tens.ten, &other, &tens.thirty}));
+    EXPECT_EQ(UnderCursor(tens.list), &other);
+}
+
+TEST(KvoSkipList, IndexingBeforeTheFirstGivesALostSlot)
+{
+    Tens tens;
+    Number other(99);
+
+    tens.list[&five] = &other;
+    KvoObject* again = tens.list[&five];
+
+    EXPECT_EQ(again, nullptr);
+    EXPECT_EQ(tens.list.SearchAlmost(&five), nullptr);
+    EXPECT_EQ(tens.list.current, tens.list.header);
+    EXPECT_EQ(ObjectsOf(tens.list),
+              (Objects{&tens.ten, &tens.twenty, &tens.thirty}));
+}
+
+TEST(KvoSkipList, HeaderNeverYieldsAnObject)
+{
+    Tens tens;
+    Number other(99);
+    tens.list[&five] = &other;
+
+    EXPECT_EQ(tens.list.Search(&five), nullptr);
+    EXPECT_EQ(tens.list.SearchAlmost(&five), nullptr);
+    tens.list.Clear();
+    EXPECT_EQ(tens.list.Tail(), nullptr);
+}
+
+TEST(KvoSkipList, ConstIndexingMovesTheCursorToo)
+{
+    Tens tens;
+    const KvoSkipList& reading = tens.list;
+
+    EXPECT_EQ(reading[&twenty_five], &tens.twenty);
+    EXPECT_EQ(UnderCursor(reading), &tens.twenty);
+    EXPECT_EQ(reading[&five], nullptr);
+}
+
+TEST(KvoSkipList, EmptiedSlotStopsASearchAndIsNeverAsked)
+{
+    Tens tens;
+    tens.list[&twenty] = nullptr;
+
+    EXPECT_EQ(tens.list.Search(&thirty), nullptr);
+    EXPECT_EQ(tens.list.Head(), &tens.ten);
+    EXPECT_EQ(tens.list.Next(), nullptr);
+    EXPECT_EQ(tens.list.Next(), &tens.thirty);
+    tens.list.CloneContents();
+    tens.list.DeleteContents();
+    EXPECT_EQ(Number::alive, 3);
+}
+
+TEST(KvoSkipList, HeadAndNextWalkToTheEndAndStayThere)
+{
+    Tens tens;
+
+    EXPECT_EQ(tens.list.Head(), &tens.ten);
+    EXPECT_EQ(tens.list.current, tens.list.header->forward[0]);
+    EXPECT_EQ(tens.list.Peek(), &tens.twenty);
+    EXPECT_EQ(tens.list.Next(), &tens.twenty);
+    EXPECT_EQ(tens.list.Next(), &tens.thirty);
+    EXPECT_EQ(tens.list.Peek(), nullptr);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.thirty);
+    EXPECT_EQ(tens.list.Next(), nullptr);
+    EXPECT_EQ(tens.list.current, nullptr);
+    EXPECT_EQ(tens.list.Next(), nullptr);
+    EXPECT_EQ(tens.list.Peek(), nullptr);
+}
+
+TEST(KvoSkipList, TailIsTheLast)
+{
+    Tens tens;
+
+    EXPECT_EQ(tens.list.Tail(), &tens.thirty);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.thirty);
+}
+
+TEST(KvoSkipList, SplitMovesWhatIsNotLessThanTheKey)
+{
+    Tens tens;
+
+    std::unique_ptr<KvoSkipList> rest(tens.list.Split(&twenty));
+
+    EXPECT_EQ(ObjectsOf(tens.list), (Objects{&tens.ten}));
+    EXPECT_EQ(UnderCursor(tens.list), &tens.ten);
+    EXPECT_EQ(ObjectsOf(*rest), (Objects{&tens.twenty, &tens.thirty}));
+    EXPECT_EQ(rest->current, nullptr);
+}
+
+TEST(KvoSkipList, SplitBelowAllMovesEverything)
+{
+    Tens tens;
+
+    std::unique_ptr<KvoSkipList> rest(tens.list.Split(&five));
+
+    EXPECT_EQ(ObjectsOf(tens.list), Objects());
+    EXPECT_EQ(tens.list.current, tens.list.header);
+    EXPECT_EQ(ObjectsOf(*rest),
+              (Objects{&tens.ten, &tens.twenty, &tens.thirty}));
+}
+
+TEST(KvoSkipList, SplitAboveAllMovesNothing)
+{
+    Tens tens;
+
+    std::unique_ptr<KvoSkipList> rest(tens.list.Split(&forty));
+
+    EXPECT_EQ(tens.list.count, 3);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.thirty);
+    EXPECT_EQ(ObjectsOf(*rest), Objects());
+    EXPECT_EQ(rest->levels, 1);
+}
+
+TEST(KvoSkipList, SplitLowersTheLevelsOfBoth)
+{
+    FakeRandom dice;
+    dice.numbers = {Bits(1), Bits(2), Bits(3)};
+    Number one(1), two(2), three(3);
+    KvoSkipList list;
+    for (Number* number : {&one, &two, &three})
+        list.Insert(number);
+    int before = list.levels;
+    int key = 2;
+
+    std::unique_ptr<KvoSkipList> rest(list.Split(&key));
+    key = 3;
+    std::unique_ptr<KvoSkipList> last(rest->Split(&key));
+
+    EXPECT_EQ(before, 4);
+    EXPECT_EQ(list.levels, 2);
+    EXPECT_EQ(rest->levels, 3);
+    EXPECT_EQ(last->levels, 4);
+    EXPECT_EQ(ObjectsOf(*last), (Objects{&three}));
+}
+
+TEST(KvoSkipList, ClearDropsEveryObject)
+{
+    Tens tens;
+
+    tens.list.Clear();
+    bool empty = tens.list.count == 0 && !tens.list.current;
+    tens.list.Insert(&tens.twenty);
+
+    EXPECT_TRUE(empty);
+    EXPECT_EQ(ObjectsOf(tens.list), (Objects{&tens.twenty}));
+    EXPECT_EQ(Number::alive, 3);
+}
+
+TEST(KvoSkipList, DestroyingItLeavesTheObjectsAlive)
+{
+    Number number(1);
+    {
+        KvoSkipList list;
+        list.Insert(&number);
+    }
+
+    EXPECT_EQ(Number::alive, 1);
+}
+
+TEST(KvoSkipList, DeleteContentsDeletesEveryObject)
+{
+    KvoSkipList list;
+    list.Insert(new Number(2));
+    list.Insert(new Number(1));
+    ASSERT_EQ(Number::alive, 2);
+
+    list.DeleteContents();
+
+    EXPECT_EQ(Number::alive, 0);
+    EXPECT_EQ(ObjectsOf(list), Objects());
+    EXPECT_EQ(list.current, nullptr);
+}
+
+TEST(KvoSkipList, CloneContentsLeavesTheOldObjectsToOthers)
+{
+    Tens tens;
+
+    tens.list.CloneContents();
+
+    EXPECT_EQ(Number::alive, 6);
+    EXPECT_NE(tens.list.Head(), &tens.ten);
+    EXPECT_EQ(static_cast<Number*>(tens.list.Head())->key, 10);
+    EXPECT_EQ(static_cast<Number*>(tens.list.Tail())->key, 30);
+    tens.list.DeleteContents();
+    EXPECT_EQ(Number::alive, 3);
+}
+
+TEST(KvoSkipList, CopyKeepsOrderAndHeights)
+{
+    FakeRandom dice;
+    dice.numbers = {Bits(1), Bits(0), Bits(2)};
+    Tens tens;
+    tens.list.SetModified();
+    const int draws = dice.draws;
+
+    KvoSkipList copy(tens.list);
+
+    EXPECT_EQ(ObjectsOf(copy), ObjectsOf(tens.list));
+    EXPECT_EQ(HeightsOf(copy), (std::vector<int>{0, 1, 2}));
+    EXPECT_EQ(copy.levels, 3);
+    EXPECT_EQ(copy.current, nullptr);
+    EXPECT_EQ(copy.IsModified(), 0);
+    EXPECT_EQ(dice.draws, draws);
+    copy.Clear();
+    EXPECT_EQ(tens.list.count, 3);
+}
+
+TEST(KvoSkipList, AssignmentTakesOrderAndHeights)
+{
+    FakeRandom dice;
+    dice.numbers = {Bits(1), Bits(0), Bits(2), Bits(1), Bits(2), Bits(3)};
+    Tens tens, others;
+
+    KvoSkipList& result = others.list = tens.list;
+
+    EXPECT_EQ(&result, &others.list);
+    EXPECT_EQ(ObjectsOf(others.list), ObjectsOf(tens.list));
+    EXPECT_EQ(HeightsOf(others.list), (std::vector<int>{0, 1, 2}));
+    EXPECT_EQ(others.list.current, nullptr);
+}
+
+TEST(KvoSkipList, AssignmentToItselfChangesNothing)
+{
+    Tens tens;
+    KvoSkipList& same = tens.list;
+    tens.list.Head();
+
+    tens.list = same;
+
+    EXPECT_EQ(tens.list.count, 3);
+    EXPECT_EQ(UnderCursor(tens.list), &tens.ten);
+}
+
+TEST(KvoSkipList, HeightFollowsTheLowOneBits)
+{
+    FakeRandom dice;
+    // The first one makes room: a list grows by one level at a time.
+    dice.numbers = {Bits(1), Bits(2), Bits(3), 0x7ffffff0, 1, 2, 3, 11, 7, 15};
+    std::vector<std::unique_ptr<Number>> numbers;
+    KvoSkipList list;
+    for (int i = 0; i < 10; ++i) {
+        numbers.push_back(std::make_unique<Number>(i));
+        list.Insert(numbers.back().get());
+    }
+
+    EXPECT_EQ(HeightsOf(list),
+              (std::vector<int>{1, 2, 3, 0, 0, 0, 1, 1, 2, 3}));
+}
+
+TEST(KvoSkipList, LevelsGrowByOneANodeUpToTwentyFour)
+{
+    FakeRandom dice;
+    std::vector<std::unique_ptr<Number>> numbers;
+    KvoSkipList list;
+
+    for (int i = 0; i < 30; ++i) {
+        dice.numbers.push_back(0x7fffffff);
+        numbers.push_back(std::make_unique<Number>(i));
+        list.Insert(numbers.back().get());
+        ASSERT_EQ(list.levels, std::min(i + 2, 24));
+        ASSERT_EQ(HeightsOf(list).back(), std::min(i + 1, 23));
+    }
+    EXPECT_EQ(ObjectsOf(list).size(), 30u);
+}
+
+TEST(KvoSkipList, LevelsDropWithTheTallestNodes)
+{
+    FakeRandom dice;
+    dice.numbers = {Bits(1), Bits(2), Bits(3)};
+    Tens tens;
+    int all = tens.list.levels;
+
+    tens.list.Remove(&tens.thirty);
+    int without_tallest = tens.list.levels;
+    tens.list.RemoveKey(&twenty);
+    int one_left = tens.list.levels;
+    tens.list.Remove(&tens.ten);
+
+    EXPECT_EQ(all, 4);
+    EXPECT_EQ(without_tallest, 3);
+    EXPECT_EQ(one_left, 3);
+    EXPECT_EQ(tens.list.levels, 1);
+}
+
+TEST(KvoSkipList, DrawsOnceForEachInsertionAndNeverElse)
+{
+    FakeRandom dice;
+    Tens tens;
+    const int inserted = dice.draws;
+    Number second(20);
+
+    tens.list.InsertUnique(&second);
+    tens.list.Search(&twenty);
+    tens.list.Remove(&tens.ten);
+    KvoSkipList copy(tens.list);
+    delete tens.list.Split(&twenty);
+    tens.list.Clear();
+
+    EXPECT_EQ(inserted, 3);
+    EXPECT_EQ(dice.draws, 3);
+}
+
+TEST(KvoSkipList, DrawsFromTheSystemsSequence)
+{
+    KvoSkipList list;
+    srandom(11);
+    long sequence[4];
+    for (long& number : sequence)
+        number = random();
+    srandom(11);
+    Number one(1), two(2), three(3);
+
+    list.Insert(&one);
+    list.InsertUnique(&two);
+    list.InsertUnique(&two);
+    list.Insert(&three);
+
+    EXPECT_EQ(random(), sequence[3]);
+}
+
+TEST(KvoSkipList, ForwardsLieBehindTheirNode)
+{
+    Tens tens;
+
+    for (KvoSkipList::SLNode* node = tens.list.header; node;
+         node = node->forward[0])
+        EXPECT_EQ(static_cast<void*>(node->forward),
+                  static_cast<void*>(node + 1));
+}
+
+namespace {
+/// Filled before `main` and dropped after it.
+struct Early
+{
+    Early() { list.Insert(&number); }
+
+    KvoNamedObject number{"early"};
+    KvoSkipList list;
+} early;
+} // namespace
+
+TEST(KvoSkipList, MayLiveBeforeMainAndAfterIt)
+{
+    EXPECT_EQ(early.list.Search("early"), &early.number);
+}
