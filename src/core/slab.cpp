@@ -6,7 +6,7 @@ namespace zt_core {
 
 namespace {
 // Untouched pages of a slab cost nothing, so a host with few links pays little.
-constexpr std::size_t slab_bytes = 64 * 1024;
+constexpr std::size_t slab_bytes = 65536;
 } // namespace
 
 constinit char* Slab::unused = nullptr;
