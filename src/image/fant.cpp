@@ -4,8 +4,6 @@
 
 #include <algorithm>
 #include <cstdlib>
-#include <cstring>
-#include <new>
 
 namespace zt_image {
 
@@ -130,7 +128,8 @@ void scale_down(const ZtPixel* source, std::size_t width, const FantWalk& walk,
 
 FantWalk::FantWalk(int in_pixels, int out_pixels)
     : in(in_pixels), out(out_pixels), out_per_in(static_cast<double>(out) / in),
-      spans(new (std::nothrow) FantSpan[static_cast<std::size_t>(out)])
+      spans(static_cast<FantSpan*>(
+          std::malloc(static_cast<std::size_t>(out) * sizeof(FantSpan))))
 {
     if (!spans)
         return;
@@ -153,7 +152,7 @@ FantWalk::FantWalk(int in_pixels, int out_pixels)
 
 FantWalk::~FantWalk()
 {
-    delete[] spans;
+    std::free(spans);
 }
 
 bool zoom_fant(const ZtPixel* source, int width, int height,

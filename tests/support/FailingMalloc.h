@@ -1,6 +1,8 @@
 #ifndef ZT_TESTS_FAILINGMALLOC_H
 #define ZT_TESTS_FAILINGMALLOC_H
 
+#include <initializer_list>
+
 /// Makes requests for memory fail while it lives: the one with number `first`,
 /// counted from 0 at its making, and all after it unless it is `only_one`.
 ///
