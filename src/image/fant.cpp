@@ -1,6 +1,7 @@
 #include "image/fant.h"
 
 #include "image/picture.h"
+#include "platform/pixel_lanes.h"
 
 #include <algorithm>
 #include <cstdlib>
@@ -9,133 +10,117 @@ namespace zt_image {
 
 namespace {
 
-constexpr ZtPixel averaged_bits = 0x00FFFFFF;
+using zt_platform::PixelLanes;
 
 /// Lines that are averaged side by side in the pass across: a cache line of
 /// pixels.
 constexpr std::size_t side_by_side = 16;
 
-/// Values that are summed up together.
-constexpr std::size_t lanes = 16;
-
-/// Lines of bytes, one behind the other; the last stands for all after it.
-struct Lines
+/// Where the lines of a walk are: one behind the other, and the last of them
+/// again for all that the walk looks at after it.
+class WalkLines
 {
-    const unsigned char* first;
-    std::size_t stride;
-    std::size_t last;
-
-    const unsigned char* at(std::size_t line) const
+public:
+    WalkLines(const FantWalk& walk, const ZtPixel* first, std::size_t stride)
+        : lanes(PixelLanes::current()),
+          lines(static_cast<const ZtPixel**>(
+              std::malloc(walk.reach() * sizeof(const ZtPixel*))))
     {
-        return first + std::min(line, last) * stride;
+        for (std::size_t i = 0; lines && i < walk.reach(); ++i)
+            lines[i] = first + std::min(i, walk.in_length() - 1) * stride;
     }
+
+    ~WalkLines() { std::free(lines); }
+    WalkLines(const WalkLines&) = delete;
+    WalkLines& operator=(const WalkLines&) = delete;
+
+    bool made() const { return lines != nullptr; }
+
+    /// Averages the lines of a span into one line of `count` pixels.
+    void average(const FantSpan& span, double scale, ZtPixel* out,
+                 std::size_t count) const
+    {
+        lanes.average(
+            {lines + span.first, span.count, span.head, span.tail, scale}, out,
+            count);
+    }
+
+private:
+    const PixelLanes& lanes;
+    const ZtPixel** lines;
 };
 
-/// Averages one block of values down the lines of a span.
-void average_block(const Lines& lines_in, const FantSpan& span, double scale,
-                   std::size_t at, unsigned char* out, std::size_t count)
+/// Turns a picture of `width` x `height` pixels, so that its columns become
+/// rows; the strides go from one row to the next.
+void turn(const ZtPixel* pixels, std::size_t width, std::size_t height,
+          std::size_t stride, ZtPixel* columns, std::size_t columns_stride)
 {
-    double sum[lanes] = {};
-    const unsigned char* here = lines_in.at(span.first) + at;
-    const unsigned char* next = lines_in.at(span.first + 1) + at;
-    double rest = 1.0 - span.head;
-    if (span.count == 0) {
-        for (std::size_t i = 0; i < count; ++i)
-            sum[i] = (span.head * here[i] + rest * next[i]) * span.tail;
-    } else {
-        for (std::size_t i = 0; i < count; ++i)
-            sum[i] = (span.head * here[i] + rest * next[i]) * span.head;
-        for (std::size_t line = 1; line < span.count; ++line) {
-            const unsigned char* whole = lines_in.at(span.first + line) + at;
-            for (std::size_t i = 0; i < count; ++i)
-                sum[i] += whole[i];
+    const PixelLanes& lanes = PixelLanes::current();
+    constexpr std::size_t block = PixelLanes::turned;
+    for (std::size_t y = 0; y < height; y += block)
+        for (std::size_t x = 0; x < width; x += block) {
+            const ZtPixel* from = pixels + y * stride + x;
+            ZtPixel* to = columns + x * columns_stride + y;
+            if (y + block <= height && x + block <= width) {
+                lanes.turn(from, stride, to, columns_stride);
+                continue;
+            }
+            for (std::size_t row = 0; row < std::min(block, height - y); ++row)
+                for (std::size_t i = 0; i < std::min(block, width - x); ++i)
+                    to[i * columns_stride + row] = from[row * stride + i];
         }
-        const unsigned char* cut = lines_in.at(span.first + span.count) + at;
-        for (std::size_t i = 0; i < count; ++i)
-            sum[i] += cut[i] * span.tail;
-    }
-    for (std::size_t i = 0; i < count; ++i)
-        out[i] = static_cast<unsigned char>(static_cast<int>(sum[i] * scale));
 }
 
-/// Averages lines of pixels into one line of `count` pixels.
-void average_lines(const Lines& lines_in, const FantSpan& span, double scale,
-                   ZtPixel* out, std::size_t count)
-{
-    std::size_t bytes = count * sizeof(ZtPixel);
-    unsigned char* out_bytes = reinterpret_cast<unsigned char*>(out);
-    std::size_t at = 0;
-    for (; at + lanes <= bytes; at += lanes)
-        average_block(lines_in, span, scale, at, out_bytes + at, lanes);
-    if (at < bytes)
-        average_block(lines_in, span, scale, at, out_bytes + at, bytes - at);
-    for (std::size_t i = 0; i < count; ++i)
-        out[i] &= averaged_bits;
-}
-
-/// Scales up to `side_by_side` rows across: they are turned so that pixels of
-/// one column lie side by side, averaged, and turned back.
-void scale_rows(const ZtPixel* rows, std::size_t count, const FantWalk& walk,
-                ZtPixel* turned, ZtPixel* out)
-{
-    std::size_t in_width = static_cast<std::size_t>(walk.in_length());
-    std::size_t out_width = static_cast<std::size_t>(walk.out_length());
-    for (std::size_t x = 0; x < in_width; ++x)
-        for (std::size_t row = 0; row < count; ++row)
-            turned[x * side_by_side + row] = rows[row * in_width + x];
-    Lines columns = {reinterpret_cast<const unsigned char*>(turned),
-                     side_by_side * sizeof(ZtPixel), in_width - 1};
-    ZtPixel column[side_by_side];
-    for (int x = 0; x < walk.out_length(); ++x) {
-        average_lines(columns, walk.span(x), walk.scale(), column,
-                      side_by_side);
-        for (std::size_t row = 0; row < count; ++row)
-            out[row * out_width + static_cast<std::size_t>(x)] = column[row];
-    }
-}
-
-/// Scales a picture across.
+/// Scales a picture across, a band of rows at a time: the band is turned, its
+/// columns are averaged, and the averages are turned back.
 ///
 /// Returns: false for lack of memory.
 bool scale_across(const ZtPixel* source, std::size_t height,
                   const FantWalk& walk, ZtPixel* out)
 {
-    std::size_t in_width = static_cast<std::size_t>(walk.in_length());
-    std::size_t out_width = static_cast<std::size_t>(walk.out_length());
-    ZtPixel* turned = new_zeroed_pixels(in_width, side_by_side);
+    std::size_t width = walk.in_length();
+    std::size_t new_width = walk.out_length();
+    ZtPixel* turned = new_zeroed_pixels(width + new_width, side_by_side);
     if (!turned)
         return false;
-    for (std::size_t y = 0; y < height; y += side_by_side)
-        scale_rows(source + y * in_width, std::min(side_by_side, height - y),
-                   walk, turned, out + y * out_width);
+    ZtPixel* averages = turned + width * side_by_side;
+    WalkLines columns(walk, turned, side_by_side);
+    for (std::size_t y = 0; columns.made() && y < height; y += side_by_side) {
+        std::size_t count = std::min(side_by_side, height - y);
+        turn(source + y * width, width, count, width, turned, side_by_side);
+        for (std::size_t x = 0; x < new_width; ++x)
+            columns.average(walk.span(x), walk.scale(),
+                            averages + x * side_by_side, side_by_side);
+        turn(averages, count, new_width, side_by_side, out + y * new_width,
+             new_width);
+    }
     std::free(turned);
-    return true;
+    return columns.made();
 }
 
 /// Scales a picture down its columns.
-void scale_down(const ZtPixel* source, std::size_t width, const FantWalk& walk,
+///
+/// Returns: false for lack of memory.
+bool scale_down(const ZtPixel* source, std::size_t width, const FantWalk& walk,
                 ZtPixel* out)
 {
-    Lines rows = {reinterpret_cast<const unsigned char*>(source),
-                  width * sizeof(ZtPixel),
-                  static_cast<std::size_t>(walk.in_length()) - 1};
-    for (int y = 0; y < walk.out_length(); ++y)
-        average_lines(rows, walk.span(y), walk.scale(),
-                      out + static_cast<std::size_t>(y) * width, width);
+    WalkLines rows(walk, source, width);
+    for (std::size_t y = 0; rows.made() && y < walk.out_length(); ++y)
+        rows.average(walk.span(y), walk.scale(), out + y * width, width);
+    return rows.made();
 }
 
 } // namespace
 
 FantWalk::FantWalk(int in_pixels, int out_pixels)
-    : in(in_pixels), out(out_pixels), out_per_in(static_cast<double>(out) / in),
-      spans(static_cast<FantSpan*>(
-          std::malloc(static_cast<std::size_t>(out) * sizeof(FantSpan))))
+    : in(static_cast<std::size_t>(in_pixels)),
+      out(static_cast<std::size_t>(out_pixels)),
+      out_per_in(static_cast<double>(out_pixels) / in_pixels), last_position(0),
+      spans(static_cast<FantSpan*>(std::malloc(out * sizeof(FantSpan))))
 {
-    if (!spans)
-        return;
     double inseg = 1.0; // What is left of the present source pixel.
     std::size_t position = 0;
-    for (int i = 0; i < out; ++i) {
+    for (std::size_t i = 0; spans && i < out; ++i) {
         double outseg = 1.0 / out_per_in; // What the present pixel still needs.
         FantSpan span = {position, 0, inseg, 0.0};
         while (inseg < outseg) {
@@ -145,6 +130,7 @@ FantWalk::FantWalk(int in_pixels, int out_pixels)
         }
         span.tail = outseg;
         inseg -= outseg;
+        last_position = position + std::max<std::size_t>(span.count, 1);
         position += span.count;
         spans[i] = span;
     }
@@ -158,15 +144,12 @@ FantWalk::~FantWalk()
 bool zoom_fant(const ZtPixel* source, int width, int height,
                ZtPixel* destination, int new_width, int new_height)
 {
-    std::size_t rows = static_cast<std::size_t>(height);
-    std::size_t columns = static_cast<std::size_t>(new_width);
     FantWalk across(width, new_width);
     FantWalk down(height, new_height);
-    ZtPixel* half_done = new_pixels(columns, rows);
+    ZtPixel* half_done = new_pixels(across.out_length(), down.in_length());
     bool done = across.made() && down.made() && half_done &&
-                scale_across(source, rows, across, half_done);
-    if (done)
-        scale_down(half_done, columns, down, destination);
+                scale_across(source, down.in_length(), across, half_done) &&
+                scale_down(half_done, across.out_length(), down, destination);
     std::free(half_done);
     return done;
 }

@@ -42,15 +42,20 @@ public:
     /// Tells whether there was memory for the walk.
     bool made() const { return spans != nullptr; }
 
-    int in_length() const { return in; }
-    int out_length() const { return out; }
+    std::size_t in_length() const { return in; }
+    std::size_t out_length() const { return out; }
     double scale() const { return out_per_in; }
-    const FantSpan& span(int position) const { return spans[position]; }
+    const FantSpan& span(std::size_t position) const { return spans[position]; }
+
+    /// Gives how many source pixels are looked at, some of them behind the
+    /// last: it stands for all after it.
+    std::size_t reach() const { return last_position + 1; }
 
 private:
-    int in;
-    int out;
+    std::size_t in;
+    std::size_t out;
     double out_per_in;
+    std::size_t last_position;
     FantSpan* spans;
 };
 

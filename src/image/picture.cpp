@@ -1,5 +1,7 @@
 #include "image/picture.h"
 
+#include "platform/large_memory.h"
+
 #include <cstdlib>
 
 namespace zt_image {
@@ -43,7 +45,8 @@ ZtPixel* new_pixels(std::size_t width, std::size_t height,
         return nullptr;
     std::size_t bytes = width * height * sizeof(ZtPixel) + extra_bytes;
     // A picture of no pixels is a picture all the same, and not null.
-    return static_cast<ZtPixel*>(std::malloc(bytes ? bytes : 1));
+    return static_cast<ZtPixel*>(
+        zt_platform::new_large_block(bytes ? bytes : 1));
 }
 
 ZtPixel* new_zeroed_pixels(std::size_t width, std::size_t height)

@@ -1,29 +1,31 @@
 #include "image/pixel_rows.h"
 
+#include "platform/pixel_lanes.h"
+
 namespace zt_image {
+
+using zt_platform::PixelLanes;
 
 void join_channels(const ChannelRows& rows, std::size_t count,
                    ChannelOrder order, ZtPixel* pixels)
 {
-    // Lowest byte of the pixel first: object order is the other way round.
-    bool codec = order == ChannelOrder::Codec;
-    const unsigned char* byte0 = rows.channel[codec ? 0 : 3];
-    const unsigned char* byte1 = rows.channel[codec ? 1 : 2];
-    const unsigned char* byte2 = rows.channel[codec ? 2 : 1];
-    const unsigned char* byte3 = rows.channel[codec ? 3 : 0];
-    for (std::size_t i = 0; i < count; ++i)
-        pixels[i] = static_cast<ZtPixel>(byte0[i]) |
-                    static_cast<ZtPixel>(byte1[i]) << 8 |
-                    static_cast<ZtPixel>(byte2[i]) << 16 |
-                    static_cast<ZtPixel>(byte3[i]) << 24;
+    const auto& of = rows.channel;
+    if (order == ChannelOrder::Codec)
+        PixelLanes::current().join({of[0], of[1], of[2], of[3]}, pixels, count);
+    else
+        PixelLanes::current().join({of[3], of[2], of[1], of[0]}, pixels, count);
 }
 
-void take_channel(const ZtPixel* pixels, std::size_t count, ChannelOrder order,
-                  int channel, unsigned char* values)
+void take_channels(const ZtPixel* pixels, std::size_t count, ChannelOrder order,
+                   const ChannelRoom& rows)
 {
-    int shift = channel_shift(order, channel);
-    for (std::size_t i = 0; i < count; ++i)
-        values[i] = static_cast<unsigned char>(pixels[i] >> shift);
+    const auto& of = rows.channel;
+    if (order == ChannelOrder::Codec)
+        PixelLanes::current().split(pixels, {of[0], of[1], of[2], of[3]},
+                                    count);
+    else
+        PixelLanes::current().split(pixels, {of[3], of[2], of[1], of[0]},
+                                    count);
 }
 
 void take_luminance(const ZtPixel* pixels, std::size_t count,

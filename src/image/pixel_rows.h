@@ -20,9 +20,15 @@ struct ChannelRows
 void join_channels(const ChannelRows& rows, std::size_t count,
                    ChannelOrder order, ZtPixel* pixels);
 
-/// Takes one channel, 0 being red and 3 alpha, out of `count` pixels.
-void take_channel(const ZtPixel* pixels, std::size_t count, ChannelOrder order,
-                  int channel, unsigned char* values);
+/// Four rows that channel values are put in.
+struct ChannelRoom
+{
+    unsigned char* channel[4];
+};
+
+/// Takes the four channels out of `count` pixels.
+void take_channels(const ZtPixel* pixels, std::size_t count, ChannelOrder order,
+                   const ChannelRoom& rows);
 
 /// Takes the luminance out of `count` pixels: of 256 parts 79 red, 156 green
 /// and 21 blue.

@@ -1,11 +1,15 @@
 #include "image/sgi_packets.h"
 
+#include "platform/pixel_lanes.h"
+
 #include <algorithm>
 #include <cstring>
 
 namespace zt_image {
 
 namespace {
+
+using zt_platform::PixelLanes;
 
 constexpr unsigned literal_bit = 0x80;
 constexpr unsigned count_bits = 0x7F;
@@ -85,26 +89,13 @@ const unsigned char* expand_repeat(const unsigned char* packets,
     return packets + 1;
 }
 
-/// Gives the position of the first of three equal values at or after `from`;
-/// where there are none, of the last two values, or `from` if it is later.
-std::size_t find_repeat(const unsigned char* values, std::size_t from,
-                        std::size_t width)
+/// Gives how many values go out as they are: up to the first three that are
+/// equal or, where there are none, up to the last two.
+std::size_t count_literals(const PixelLanes& lanes, const unsigned char* values,
+                           std::size_t count)
 {
-    std::size_t at = from;
-    while (at + 2 < width &&
-           (values[at] != values[at + 1] || values[at + 1] != values[at + 2]))
-        ++at;
-    return at;
-}
-
-/// Gives the position of the first value after `from` that is another one.
-std::size_t find_other(const unsigned char* values, std::size_t from,
-                       std::size_t width)
-{
-    std::size_t at = from + 1;
-    while (at < width && values[at] == values[from])
-        ++at;
-    return at;
+    std::size_t found = lanes.find_three_equal(values, count);
+    return found < count ? found : std::max<std::size_t>(count, 2) - 2;
 }
 
 unsigned char* put_literals(const unsigned char* values, std::size_t count,
@@ -113,7 +104,7 @@ unsigned char* put_literals(const unsigned char* values, std::size_t count,
     while (count) {
         std::size_t todo = std::min(count, most_in_a_packet);
         *packets++ = static_cast<unsigned char>(literal_bit | todo);
-        std::memcpy(packets, values, todo);
+        copy_values(packets, values, todo);
         packets += todo;
         values += todo;
         count -= todo;
@@ -181,12 +172,17 @@ void expand_row(const unsigned char* packets, const unsigned char* packets_end,
 unsigned char* compress_row(const unsigned char* values, std::size_t width,
                             unsigned char* packets)
 {
-    std::size_t at = 0;
-    while (at < width) {
-        std::size_t repeat = find_repeat(values, at, width);
-        packets = put_literals(values + at, repeat - at, packets);
-        at = find_other(values, repeat, width);
-        packets = put_repeats(values[repeat], at - repeat, packets);
+    const PixelLanes& lanes = PixelLanes::current();
+    const unsigned char* end = values + width;
+    while (values != end) {
+        std::size_t literals = count_literals(
+            lanes, values, static_cast<std::size_t>(end - values));
+        packets = put_literals(values, literals, packets);
+        values += literals;
+        std::size_t repeats =
+            lanes.count_equal(values, static_cast<std::size_t>(end - values));
+        packets = put_repeats(*values, repeats, packets);
+        values += repeats;
     }
     *packets++ = 0;
     return packets;

@@ -45,8 +45,9 @@ constexpr std::size_t most_packet_bytes(std::size_t width)
 
 /// Compresses a row of channel values.
 ///
-/// Requires: room for `most_packet_bytes(width)` at `packets` and
-///           `packet_slack` more.
+/// Requires: room for `most_packet_bytes(width)` at `packets`; `packet_slack`
+///           bytes behind it that may be written and behind
+///           `values + width` that may be read.
 /// Returns:  the end of the packets, behind the closing zero.
 unsigned char* compress_row(const unsigned char* values, std::size_t width,
                             unsigned char* packets);

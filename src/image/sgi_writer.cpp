@@ -116,18 +116,18 @@ private:
 /// Writes the channels of one row of pixels.
 bool write_row(RowWriter& writer, const ZtPixel* pixels, ChannelOrder order,
                int zsize, std::size_t ysize, std::size_t y,
-               unsigned char* values)
+               const ChannelRoom& rows)
 {
     std::size_t width = writer.row_width();
     if (zsize == 1) {
-        take_luminance(pixels, width, order, values);
-        return writer.add(values, y);
+        take_luminance(pixels, width, order, rows.channel[0]);
+        return writer.add(rows.channel[0], y);
     }
-    for (int z = 0; z < zsize; ++z) {
-        take_channel(pixels, width, order, z, values);
-        if (!writer.add(values, y + static_cast<std::size_t>(z) * ysize))
+    take_channels(pixels, width, order, rows);
+    for (int z = 0; z < zsize; ++z)
+        if (!writer.add(rows.channel[z],
+                        y + static_cast<std::size_t>(z) * ysize))
             return false;
-    }
     return true;
 }
 
@@ -147,14 +147,16 @@ bool write_sgi(const ZtPixel* pixels, int xsize, int ysize, int zsize,
         return false;
     std::size_t width = static_cast<std::size_t>(xsize);
     std::size_t height = static_cast<std::size_t>(ysize);
-    unsigned char* values = new_bytes(width + packet_slack);
+    unsigned char* values = new_bytes(4 * width + packet_slack);
     if (!values)
         return false;
+    ChannelRoom rows = {
+        {values, values + width, values + 2 * width, values + 3 * width}};
     RowWriter writer(name, xsize, ysize, zsize);
     bool sound = writer.is_open();
     for (std::size_t y = 0; sound && y < height; ++y)
         sound = write_row(writer, pixels + y * width, order, zsize, height, y,
-                          values);
+                          rows);
     std::free(values);
     return writer.finish() && sound;
 }

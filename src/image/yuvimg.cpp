@@ -15,6 +15,16 @@ constexpr int frame_height = 486;
 constexpr std::size_t line_bytes = frame_width * 2;
 constexpr std::size_t frame_bytes = line_bytes * frame_height;
 
+constexpr int luma_offset = 16;
+constexpr int chroma_offset = 128;
+
+/// How much the samples weigh, in units of 1/65536.
+constexpr int luma_weight = 76310;
+constexpr int red_weight = 104635;
+constexpr int green_weight1 = 25690;
+constexpr int green_weight2 = 53294;
+constexpr int blue_weight = 132278;
+
 /// Clamps a sum that was made modulo 2^32, as only samples that no video holds
 /// can tell.
 constexpr int clamp_fixed(std::uint32_t sum)
@@ -25,27 +35,33 @@ constexpr int clamp_fixed(std::uint32_t sum)
     return value < 0x10000 ? 0 : value;
 }
 
-ZtPixel pixel_of(ChannelOrder order, int luma, int chroma1, int chroma2)
+/// Gives the whole part of a sum of `decode_yuv` after its clamping: one that
+/// is too large gives 255, one below 1 gives 0.
+constexpr ZtPixel whole_part(int sum)
 {
-    int red;
-    int green;
-    int blue;
-    decode_yuv(red, green, blue, luma, chroma1, chroma2);
-    return make_pixel(order, static_cast<ZtPixel>(red >> 16),
-                      static_cast<ZtPixel>(green >> 16),
-                      static_cast<ZtPixel>(blue >> 16), 0);
+    return static_cast<ZtPixel>(std::clamp(sum >> 16, 0, 0xFF));
+}
+
+/// Decodes a pixel as `decode_yuv` does, for samples that are in a file.
+constexpr ZtPixel decode_pixel(ChannelOrder order, int luma, int chroma1,
+                               int chroma2)
+{
+    int y = std::max(luma - luma_offset, 0) * luma_weight;
+    int u = chroma1 - chroma_offset;
+    int v = chroma2 - chroma_offset;
+    return make_pixel(order, whole_part(y + red_weight * v),
+                      whole_part(y - green_weight1 * u - green_weight2 * v),
+                      whole_part(y + blue_weight * u), 0);
 }
 
 /// Decodes a line: groups of first chroma, luma, second chroma, luma.
-void decode_line(const unsigned char* raw, ZtPixel* pixels, ChannelOrder order)
+template <ChannelOrder order>
+void decode_line(const unsigned char* raw, ZtPixel* pixels)
 {
-    for (std::size_t i = 0; i < line_bytes; i += 4, pixels += 2) {
-        int chroma1 = raw[i] - 128;
-        int chroma2 = raw[i + 2] - 128;
-        pixels[0] =
-            pixel_of(order, std::max(raw[i + 1] - 16, 0), chroma1, chroma2);
-        pixels[1] =
-            pixel_of(order, std::max(raw[i + 3] - 16, 0), chroma1, chroma2);
+    for (int group = 0; group < frame_width / 2; ++group) {
+        const unsigned char* of = raw + 4 * group;
+        pixels[2 * group] = decode_pixel(order, of[1], of[0], of[2]);
+        pixels[2 * group + 1] = decode_pixel(order, of[3], of[0], of[2]);
     }
 }
 
@@ -61,8 +77,12 @@ bool decode_frame(const zt_platform::InputFile& file, ZtPixel* pixels,
         return false;
     file.read_at(0, raw, frame_bytes);
     for (int line = frame_height - 1; line >= 0; --line) {
-        decode_line(raw + static_cast<std::size_t>(line) * line_bytes, pixels,
-                    order);
+        const unsigned char* from =
+            raw + static_cast<std::size_t>(line) * line_bytes;
+        if (order == ChannelOrder::Codec)
+            decode_line<ChannelOrder::Codec>(from, pixels);
+        else
+            decode_line<ChannelOrder::Object>(from, pixels);
         pixels += frame_width;
     }
     std::free(raw);
@@ -93,13 +113,16 @@ Picture read_yuv(const char* name, ChannelOrder order)
 void decode_yuv(int& red, int& green, int& blue, int luma, int chroma1,
                 int chroma2)
 {
-    using zt_image::clamp_fixed;
-    std::uint32_t y = static_cast<std::uint32_t>(luma) * 76310u;
-    std::uint32_t u = static_cast<std::uint32_t>(chroma1);
-    std::uint32_t v = static_cast<std::uint32_t>(chroma2);
-    red = clamp_fixed(y + 104635u * v);
-    green = clamp_fixed(y - 25690u * u - 53294u * v);
-    blue = clamp_fixed(y + 132278u * u);
+    using namespace zt_image;
+    auto product = [](int weight, int sample) {
+        return static_cast<std::uint32_t>(weight) *
+               static_cast<std::uint32_t>(sample);
+    };
+    std::uint32_t y = product(luma_weight, luma);
+    red = clamp_fixed(y + product(red_weight, chroma2));
+    green = clamp_fixed(y - product(green_weight1, chroma1) -
+                        product(green_weight2, chroma2));
+    blue = clamp_fixed(y + product(blue_weight, chroma1));
 }
 
 ZtPixel* longimageyuvdata(const char* name)

@@ -15,8 +15,9 @@ std::string Compressed(const std::string& values)
 {
     std::vector<unsigned char> out(zt_image::most_packet_bytes(values.size()) +
                                    zt_image::packet_slack);
+    std::string padded = values + Fill(zt_image::packet_slack, 0x55);
     unsigned char* end = zt_image::compress_row(
-        reinterpret_cast<const unsigned char*>(values.data()), values.size(),
+        reinterpret_cast<const unsigned char*>(padded.data()), values.size(),
         out.data());
     return std::string(out.data(), end);
 }

@@ -1,0 +1,23 @@
+#ifndef ZT_PLATFORM_LARGE_MEMORY_H
+#define ZT_PLATFORM_LARGE_MEMORY_H
+
+/// \file
+/// Memory for pictures and the like, large blocks that are written from one
+/// end to the other.
+///
+/// The first touch of each page costs more than what is written there; large
+/// blocks are put on the largest pages the system has.
+
+#include <cstddef>
+
+namespace zt_platform {
+
+/// Gives memory that is not cleared.
+///
+/// Owner:   the caller, who releases it with `free`.
+/// Returns: null for lack of memory.
+void* new_large_block(std::size_t bytes);
+
+} // namespace zt_platform
+
+#endif

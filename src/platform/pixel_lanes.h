@@ -1,0 +1,96 @@
+#ifndef ZT_PLATFORM_PIXEL_LANES_H
+#define ZT_PLATFORM_PIXEL_LANES_H
+
+/// \file
+/// Work on rows of pixels that a processor can do for many pixels at a time.
+///
+/// The class itself does all of it one pixel after the other, on any
+/// processor, and is what everything else is held to: a derived class does the
+/// same in wider steps and gives the same bits. Which one is in use is decided
+/// once, by what the processor can do.
+
+#include <cstddef>
+#include <cstdint>
+
+namespace zt_platform {
+
+class PixelLanes
+{
+public:
+    /// Gives a name for tests and measurements.
+    virtual const char* name() const;
+
+    /// Makes words of four rows of bytes; `bytes[0]` are the lowest.
+    virtual void join(const unsigned char* const (&bytes)[4],
+                      std::uint32_t* words, std::size_t count) const;
+
+    /// Takes words apart into four rows of bytes; `bytes[0]` are the lowest.
+    virtual void split(const std::uint32_t* words,
+                       unsigned char* const (&bytes)[4],
+                       std::size_t count) const;
+
+    /// Gives the position of the first of three equal bytes in a row, `count`
+    /// if there are none.
+    virtual std::size_t find_three_equal(const unsigned char* bytes,
+                                         std::size_t count) const;
+
+    /// Gives how many bytes from the first on are equal.
+    ///
+    /// Requires: at least one byte.
+    virtual std::size_t count_equal(const unsigned char* bytes,
+                                    std::size_t count) const;
+
+    /// Turns a block of 8 rows of 8 words, so that its columns become rows.
+    ///
+    /// Units: the strides, from one row to the next, in words.
+    static constexpr std::size_t turned = 8;
+    virtual void turn(const std::uint32_t* words, std::size_t stride,
+                      std::uint32_t* columns, std::size_t columns_stride) const;
+
+    /// Averages lines of words, the three low bytes of each word by itself;
+    /// the high byte of the result is 0.
+    ///
+    /// With w the value of a byte: if `whole` is 0 the result is
+    /// ((w0 * head + w1 * (1 - head)) * tail) * scale; otherwise the first
+    /// line's (w0 * head + w1 * (1 - head)) * head, then all of the lines 1 to
+    /// whole - 1, then w * tail of line `whole`, summed up in this order and
+    /// times `scale`; cut to an integer.
+    ///
+    /// Requires: lines[0] to lines[max(whole, 1)].
+    struct Average
+    {
+        const std::uint32_t* const* lines;
+        std::size_t whole;
+        double head;
+        double tail;
+        double scale;
+    };
+    virtual void average(const Average& lines, std::uint32_t* averages,
+                         std::size_t count) const;
+
+    /// Gives what is in use: the fastest that this processor can do, or what a
+    /// test installed.
+    static const PixelLanes& current();
+
+    /// Installs others; null restores the fastest.
+    ///
+    /// Owner: the caller, who installs others before destroying them.
+    static void install(const PixelLanes* other);
+
+    /// Gives those that do one pixel after the other.
+    static const PixelLanes& plain();
+
+    /// Gives the fastest that this processor can do.
+    static const PixelLanes& fastest();
+
+protected:
+    ~PixelLanes() = default;
+
+    /// Averages the words from number `at` on.
+    static void average_from(const Average& lines, std::uint32_t* averages,
+                             std::size_t at, std::size_t count);
+};
+
+} // namespace zt_platform
+
+#endif

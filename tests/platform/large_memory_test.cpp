@@ -1,0 +1,65 @@
+#include "platform/large_memory.h"
+
+#include <cstdint>
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <sstream>
+#include <string>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using zt_platform::new_large_block;
+
+/// Gives the system's marks of the memory around an address.
+std::string MarksAt(const void* address)
+{
+    std::ifstream in("/proc/self/smaps");
+    bool inside = false;
+    for (std::string line; std::getline(in, line);) {
+        unsigned long long from = 0;
+        unsigned long long to = 0;
+        if (std::sscanf(line.c_str(), "%llx-%llx ", &from, &to) == 2)
+            inside = reinterpret_cast<std::uintptr_t>(address) >= from &&
+                     reinterpret_cast<std::uintptr_t>(address) < to;
+        if (inside && line.starts_with("VmFlags:"))
+            return line + " ";
+    }
+    return "";
+}
+
+TEST(large_memory, ABlockOfAnySizeCanBeFilledAndReleased)
+{
+    for (std::size_t bytes :
+         {std::size_t{1}, std::size_t{100}, std::size_t{2} << 20,
+          (std::size_t{2} << 20) - 1, (std::size_t{9} << 20) + 5}) {
+        void* block = new_large_block(bytes);
+
+        ASSERT_NE(block, nullptr);
+        std::memset(block, 0x5A, bytes);
+        std::free(block);
+    }
+}
+
+TEST(large_memory, MoreThanThereIsIsNull)
+{
+    EXPECT_EQ(new_large_block(SIZE_MAX / 2 + 1), nullptr);
+}
+
+TEST(large_memory, ALargeBlockAsksForLargePagesWhereTheSystemHasThem)
+{
+    const std::size_t bytes = std::size_t{9} << 20;
+    char* block = static_cast<char*>(new_large_block(bytes));
+    ASSERT_NE(block, nullptr);
+
+    bool asked = MarksAt(block + bytes / 2).find(" hg ") != std::string::npos;
+
+    EXPECT_EQ(asked, std::filesystem::exists(
+                         "/sys/kernel/mm/transparent_hugepage/enabled"));
+    std::free(block);
+}
+
+} // namespace
