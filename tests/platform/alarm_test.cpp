@@ -86,7 +86,7 @@ TEST_F(AlarmTest, TheHandlerStaysRestartsCallsAndHoldsSignalsBack)
 
     EXPECT_EQ(alarms, 2);
     EXPECT_NE(Action().sa_flags & SA_RESTART, 0);
-    EXPECT_EQ(Action().sa_flags & SA_RESETHAND, 0);
+    EXPECT_FALSE(Action().sa_flags & static_cast<int>(SA_RESETHAND));
     const sigset_t mask = Action().sa_mask;
     EXPECT_EQ(sigismember(&mask, SIGTERM), 1);
     EXPECT_EQ(sigismember(&mask, SIGSEGV), 0);

@@ -87,7 +87,7 @@ TEST_F(ZtTimerBeatTest, TheHandlerRestartsCallsAndHoldsOtherSignalsBack)
     sigaction(SIGALRM, nullptr, &now);
 
     EXPECT_NE(now.sa_flags & SA_RESTART, 0);
-    EXPECT_EQ(now.sa_flags & SA_RESETHAND, 0);
+    EXPECT_FALSE(now.sa_flags & static_cast<int>(SA_RESETHAND));
     EXPECT_EQ(sigismember(&now.sa_mask, SIGINT), 1);
     EXPECT_EQ(sigismember(&now.sa_mask, SIGSEGV), 0);
 }
