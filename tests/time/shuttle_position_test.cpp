@@ -251,8 +251,10 @@ TEST(ZtShuttle, ForwardFromTheOutPointEndsAtOnce)
     RecordingShuttle shuttle;
     shuttle.Mark(10, 20, 20);
     shuttle.SetState(ZtShuttle::Play, 0);
-    EXPECT_EQ(shuttle.state, ZtShuttle::Play);
 
+    // The end itself still belongs to the range.
+    EXPECT_EQ(shuttle.Time(), KvoTime(0, 0, 20, 0));
+    EXPECT_EQ(shuttle.state, ZtShuttle::Play);
     EXPECT_EQ(shuttle.After(0.001), KvoTime(0, 0, 20, 0));
     EXPECT_EQ(shuttle.state, ZtShuttle::Stopped);
 }
