@@ -191,6 +191,9 @@ TEST(KvoTime, DoublesAndFloatsKeepTheirPrecision)
     // 1000000.005 frames are 200000001 ticks; a float has no such number.
     EXPECT_EQ(KvoTime(1000000.005001).Ticks(), 200000001);
     EXPECT_EQ(KvoTime(1000000.005001f).Ticks(), 200000000);
+    // The product 16777217.1875 rounds to the even number beside it.
+    EXPECT_EQ(KvoTime(83886.0859375).Ticks(), 16777217);
+    EXPECT_EQ(KvoTime(83886.0859375f).Ticks(), 16777218);
 }
 
 TEST(KvoTime, NumbersThatNoTickCountHoldsSaturate)

@@ -263,6 +263,7 @@ TEST(KvoTime, ReadTakesPointsAndColonsAlike)
 TEST(KvoTime, ReadSkipsSeparatorsWithNoFieldBeforeThem)
 {
     EXPECT_EQ(TicksRead("3:"), Ticks(0, 0, 0, 3));
+    EXPECT_EQ(TicksRead("3."), Ticks(0, 0, 0, 3));
     EXPECT_EQ(TicksRead(":3"), Ticks(0, 0, 0, 3));
     EXPECT_EQ(TicksRead("1:::4"), Ticks(0, 0, 1, 4));
     EXPECT_EQ(TicksRead("::::"), 0);
