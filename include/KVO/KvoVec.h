@@ -11,9 +11,10 @@
 /// field of view is radians.
 ///
 /// Formulas are evaluated in float and in the order in which they are written
-/// here, so every machine gives the same bits, provided that the compiler may
-/// not fuse a product with a sum: a host that is built for such a processor
-/// passes `-ffp-contract=off`. Indices are checked, and a bad one reported;
+/// here, so every machine gives the same bits, as long as the compiler does
+/// not fuse a product with a sum. A host that is built for processors which
+/// can passes `-ffp-contract=off -mno-fma`; the second, since g++ 12 fuses now
+/// and then in spite of the first. Indices are checked, and a bad one reported;
 /// the components themselves are public for those who know what they do.
 
 #include <KVO/KvoCommon.h>
@@ -963,38 +964,39 @@ namespace zt_geometry {
 /// The compiler makes of it what the processor has.
 typedef float Lanes __attribute__((vector_size(16)));
 
-inline void load(Lanes& lanes, const KvoVec4& row)
-{
-    __builtin_memcpy(&lanes, &row, sizeof lanes);
-}
-
-inline void store(KvoVec4& row, const Lanes& lanes)
-{
-    __builtin_memcpy(static_cast<void*>(&row), &lanes, sizeof row);
-}
-
 /// The rows of a matrix in lanes.
 struct LaneRows
 {
-    explicit LaneRows(const KvoMat& m)
-    {
-        load(row[0], m.rows[0]);
-        load(row[1], m.rows[1]);
-        load(row[2], m.rows[2]);
-        load(row[3], m.rows[3]);
-    }
-
-    /// Gives the row vector `v` times the matrix, each sum from left to right.
-    void transform(const KvoVec4& v, KvoVec4& result) const
-    {
-        store(result,
-              v.x * row[0] + v.y * row[1] + v.z * row[2] + v.w * row[3]);
-    }
-
-    Lanes row[4];
+    Lanes row0;
+    Lanes row1;
+    Lanes row2;
+    Lanes row3;
 };
 
-/// As `LaneRows::transform`, for constant expressions.
+inline LaneRows lanes(const KvoMat& m)
+{
+    return {__builtin_bit_cast(Lanes, m.rows[0]),
+            __builtin_bit_cast(Lanes, m.rows[1]),
+            __builtin_bit_cast(Lanes, m.rows[2]),
+            __builtin_bit_cast(Lanes, m.rows[3])};
+}
+
+/// Gives the row vector `v` times a matrix, each sum from left to right.
+///
+/// Takes the components one by one: a vector has often just been put together
+/// from them, and reading it whole would have to wait for that.
+inline Lanes transformed(const KvoVec4& v, const LaneRows& m)
+{
+    return v.x * m.row0 + v.y * m.row1 + v.z * m.row2 + v.w * m.row3;
+}
+
+/// Gives the same for a row of a matrix, which is read whole.
+inline Lanes transformed(const Lanes& v, const LaneRows& m)
+{
+    return v[0] * m.row0 + v[1] * m.row1 + v[2] * m.row2 + v[3] * m.row3;
+}
+
+/// Gives the same, for constant expressions.
 constexpr KvoVec4 transformed(const KvoVec4& v, const KvoMat& m)
 {
     return v.x * m.rows[0] + v.y * m.rows[1] + v.z * m.rows[2] +
@@ -1003,11 +1005,23 @@ constexpr KvoVec4 transformed(const KvoVec4& v, const KvoMat& m)
 
 inline KvoMat product(const KvoMat& a, const KvoMat& b)
 {
-    const LaneRows rows(b);
-    KvoMat result;
-    for (int i = 0; i < 4; ++i)
-        rows.transform(a.rows[i], result.rows[i]);
-    return result;
+    const LaneRows left = lanes(a);
+    const LaneRows right = lanes(b);
+    return __builtin_bit_cast(KvoMat, LaneRows{transformed(left.row0, right),
+                                               transformed(left.row1, right),
+                                               transformed(left.row2, right),
+                                               transformed(left.row3, right)});
+}
+
+inline KvoVec4 point(const KvoVec4& v, const KvoMat& m)
+{
+    Lanes result = transformed(v, lanes(m));
+    const float w = result[3];
+    if (w != 0 && w != 1) {
+        result /= w;
+        result[3] = 1;
+    }
+    return __builtin_bit_cast(KvoVec4, result);
 }
 
 /// Divides x, y and z by w unless that is 0 or 1.
@@ -1706,9 +1720,7 @@ constexpr KvoVec4 operator*(const KvoVec4& v, const KvoMat& m)
 {
     if (__builtin_is_constant_evaluated())
         return zt_geometry::divided_by_w(zt_geometry::transformed(v, m));
-    KvoVec4 result;
-    zt_geometry::LaneRows(m).transform(v, result);
-    return zt_geometry::divided_by_w(result);
+    return zt_geometry::point(v, m);
 }
 
 constexpr KvoVec4 operator*(const KvoMat& m, const KvoVec4& v)
@@ -1798,7 +1810,9 @@ inline KvoQuat Slerp(const KvoQuat& a, const KvoQuat& b, float t)
     const float sine = std::sin(omega);
     const float wa = std::sin((1 - t) * omega) / sine;
     const float wb = std::sin(t * omega) / sine;
-    return KvoQuat(wa * a.s + wb * b.s, wa * a.v + wb * b.v);
+    return __builtin_bit_cast(
+        KvoQuat, wa * __builtin_bit_cast(zt_geometry::Lanes, a) +
+                     wb * __builtin_bit_cast(zt_geometry::Lanes, b));
 }
 
 inline KvoQuat Interp(const KvoQuat& q0, const KvoQuat& q1, const KvoQuat& q2,
