@@ -108,6 +108,10 @@ public:
 /// redirects them. It passes one on by calling `ZtErrHandler::Handle`, and
 /// deletes the ones that it keeps. Handlers are destroyed in the reverse order
 /// of their making.
+///
+/// Context: reports of the timer beat are handled inside the beat. What a
+///          subclass does in `Handle` must be allowed there, as deleting the
+///          error is; the beat is blocked while a subclass is destroyed.
 class ZT_API ZtErrHandler : public KvoObject
 {
 public:
@@ -181,7 +185,8 @@ public:
 
     ZtErrHandler* next; ///< The handler below, or null.
     int held;           ///< Not 0 while errors are held back.
-    KvoObjList queue;   ///< What is held, oldest first.
+    KvoObjList queue;   ///< What is held, oldest first. What was held inside
+                        ///< the beat joins it at the next use of a handler.
 };
 
 /// Reports a message of level 1 that begins "Debug: ".

@@ -21,6 +21,9 @@ public:
         Message();
     }
 
+    /// Tells whether there was memory for the text.
+    bool is_whole() const { return stream.good() && *message; }
+
     void stamp()
     {
         system_error = oserror();
@@ -57,6 +60,16 @@ void free_what_was_set_aside()
         free_now(error);
         error = following;
     }
+}
+
+// Returns: null when there is no memory for the error and all of its text.
+SignalErr* make_whole(const char* prefix, const char* text, int level)
+{
+    auto* const error = new (std::nothrow) SignalErr(prefix, text, level);
+    if (error && error->is_whole())
+        return error;
+    delete error;
+    return nullptr;
 }
 
 // A signal that comes between the two steps makes the exchange fail, and it is
@@ -105,7 +118,7 @@ void SignalReport::reserve(int count)
     reserve_default_handler();
     free_what_was_set_aside();
     while (ready_count < count) {
-        auto* const error = new (std::nothrow) SignalErr(prefix, text, level);
+        SignalErr* const error = make_whole(prefix, text, level);
         if (!error)
             return;
         push(ready, error);
@@ -116,7 +129,7 @@ void SignalReport::reserve(int count)
 SignalErr* SignalReport::take()
 {
     if (!in_signal())
-        return new (std::nothrow) SignalErr(prefix, text, level);
+        return make_whole(prefix, text, level);
     SignalErr* const error = ready;
     if (error) {
         ready = error->following;

@@ -7,6 +7,7 @@
 
 #include "ZT/error.h"
 #include "support/CapturedStderr.h"
+#include "support/FailingMemory.h"
 
 // A scope makes ordinary code behave as code in a signal does; the beat's own
 // tests prove that it may run in one.
@@ -151,6 +152,36 @@ TEST(SignalReport, WithNoneReadyItIsPrintedAllTheSame)
     EXPECT_EQ(captured.Text(), "Error: unreserved.\n");
     EXPECT_EQ(ZtErr::count, before + 1);
     EXPECT_EQ(trap.count, 0);
+}
+
+TEST(SignalReport, WithoutMemoryToMakeOneReadyItIsPrinted)
+{
+    constinit static SignalReport report("Error: ", "that finds no memory.\n",
+                                         4);
+    // One request for the error, and two or three for its text.
+    for (const long spared : {0, 1, 2}) {
+        {
+            const FailingMemory no_memory(spared);
+            report.reserve(1);
+            EXPECT_TRUE(FailingMemory::Failed()) << spared;
+        }
+        const int before = ZtErr::count;
+        CapturedStderr captured;
+        PostInSignal(report);
+        EXPECT_EQ(captured.Text(), "Error: that finds no memory.\n") << spared;
+        EXPECT_EQ(ZtErr::count, before + 1);
+    }
+}
+
+TEST(SignalReport, WithoutMemoryInOrdinaryCodeItIsPrinted)
+{
+    CapturedStderr captured;
+    {
+        const FailingMemory no_memory;
+        never_reserved.post();
+    }
+
+    EXPECT_EQ(captured.Text(), "Error: unreserved.\n");
 }
 
 TEST(SignalReport, ReserveMakesUpWhatWasTaken)

@@ -1,5 +1,6 @@
 #include <atomic>
 #include <csetjmp>
+#include <cstdint>
 #include <cstdlib>
 #include <signal.h>
 #include <sys/time.h>
@@ -26,9 +27,9 @@ void Count(ZtTimer*, void*)
     ++calls;
 }
 
-void Rest()
+void Rest(std::uint64_t milliseconds = 1)
 {
-    zt_platform::Clock::current().sleep_nanoseconds(1000000);
+    zt_platform::Clock::current().sleep_nanoseconds(milliseconds * 1000000);
 }
 
 void WaitForCalls(int count)
@@ -73,13 +74,12 @@ TEST_F(RealBeat, RunsOutAfterStop)
     ZtTimerBeat::stop();
     itimerval left = {};
     do {
-        Rest();
+        Rest(20);
         getitimer(ITIMER_REAL, &left);
     } while (left.it_value.tv_usec != 0);
     const int last = calls;
 
-    for (int rest = 0; rest < 20; ++rest)
-        Rest();
+    Rest(20);
 
     EXPECT_EQ(calls, last);
     raise(SIGALRM);
@@ -127,6 +127,46 @@ TEST_F(RealBeat, SurvivesAStormOfSignalsFromOutside)
         kill(getpid(), SIGALRM);
 
     WaitForCalls(calls + 5);
+}
+
+TEST_F(RealBeat, NoRequestIsLostOrDoubledWhenBeatsInterruptTheQueueing)
+{
+    static std::atomic<long> stops;
+    static std::atomic<long> misplaced;
+    stops = misplaced = 0;
+    constexpr long pairs = 40000;
+    ZtTimer counter;
+    // What is stopped last was started from the time that was set before.
+    counter.post_stop(
+        [](ZtTimer* its, void*) {
+            if (its->position_at_start.Ticks() != stops)
+                ++misplaced;
+            ++stops;
+        },
+        nullptr);
+    std::atomic<bool> over = false;
+    std::thread storm([&over, owner = pthread_self()] {
+        while (!over) {
+            pthread_kill(owner, SIGALRM);
+            for (int pause = 0; pause < 20; ++pause)
+                std::this_thread::yield();
+        }
+    });
+
+    for (int pair = 0; pair < pairs; ++pair) {
+        while (ZtTimerBeat::defer_op_count > 90)
+            std::this_thread::yield();
+        counter.force(KvoTime::FromTicks(pair));
+        counter.start();
+        counter.force(KvoTime::FromTicks(pair));
+        counter.stop();
+    }
+    over = true;
+    storm.join();
+    ZtTimerBeat::execute_ops();
+
+    EXPECT_EQ(stops, pairs);
+    EXPECT_EQ(misplaced, 0);
 }
 
 TEST_F(RealBeat, ARepeatFiresAtMostOnceAMultipleInAStorm)
@@ -203,8 +243,7 @@ TEST_F(RealBeat, AChildHasNoBeatUntilItStartsItsOwn)
     const pid_t child = fork();
     if (child == 0) {
         const int before = calls;
-        for (int rest = 0; rest < 30; ++rest)
-            Rest();
+        Rest(30);
         if (calls != before)
             _exit(1);
         ZtTimerBeat::start();
@@ -217,6 +256,27 @@ TEST_F(RealBeat, AChildHasNoBeatUntilItStartsItsOwn)
 
     EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 7) << status;
     WaitForCalls(calls + 5);
+}
+
+TEST_F(RealBeat, AProcessThatIsHaltedAndContinuedGoesOnAndTriggersFireOnce)
+{
+    const pid_t child = fork();
+    if (child == 0) {
+        static std::atomic<int> fired;
+        ZtTimerBeat::start();
+        timer.post_trigger([](ZtTimer*, void*) { ++fired; }, nullptr,
+                           KvoTime(KvoTime::milliseconds, 100));
+        WaitForCalls(calls + 200);
+        _exit(fired == 1 ? 7 : 1);
+    }
+    Rest(50);
+    kill(child, SIGSTOP);
+    Rest(400);
+    kill(child, SIGCONT);
+    int status = 0;
+    ASSERT_EQ(waitpid(child, &status, 0), child);
+
+    EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 7) << status;
 }
 
 /// Touched by callbacks until the very end, and destroyed before the library.
@@ -245,8 +305,7 @@ void BeatFastOnAStatic()
     ZtTimerBeat::start();
     its_timer.post_repeat(Touch, &touched, 0);
     its_timer.start();
-    for (int rest = 0; rest < 5; ++rest)
-        Rest();
+    Rest(5);
 }
 
 TEST(RealBeatDeath, AProcessThatExitsWithoutStopEndsCleanly)

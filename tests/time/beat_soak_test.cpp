@@ -127,7 +127,7 @@ private:
     /// Asks for something when there is sure to be room in the queue.
     void Request()
     {
-        if (ZtTimerBeat::defer_op_count > 40)
+        if (ZtTimerBeat::defer_op_count > 60)
             return;
         counter.force(KvoTime::FromTicks(static_cast<int>(requested % numbers) *
                                          spacing));
