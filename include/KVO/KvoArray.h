@@ -131,6 +131,7 @@ class ZT_API KvoTypedArray : public KvoArray
 public:
     /// Makes an array of `initial_size` zero elements.
     explicit KvoTypedArray(int initial_size = 0)
+        // NOLINTNEXTLINE(bugprone-sizeof-expression): also of a pointer
         : KvoArray(static_cast<int>(sizeof(Element)), initial_size)
     {}
 

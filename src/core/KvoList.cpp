@@ -314,6 +314,8 @@ KvoListIter::KvoListIter(const KvoListIter& other)
 
 KvoListIter& KvoListIter::operator=(const KvoListIter& other)
 {
+    if (this == &other)
+        return *this;
     list = other.list;
     modifying = other.modifying;
     direction = other.direction;
