@@ -16,7 +16,7 @@
 ///
 /// The links of all lists come from one store, to which they return and which
 /// is never given back to the system. When memory runs out an insertion leaves
-/// the list as it was, without a report.
+/// the list as it was and a copy ends early, without a report.
 ///
 /// Context: one thread; never inside the beat or a signal.
 class ZT_API KvoList

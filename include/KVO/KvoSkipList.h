@@ -19,7 +19,7 @@
 ///
 /// The list owns its nodes, not its objects. The nodes of all lists come from
 /// one store, which is never given back to the system. When memory runs out an
-/// insertion leaves the list as it was, without a report.
+/// insertion leaves the list as it was and a copy ends early, without a report.
 ///
 /// Context: one thread; never inside the beat or a signal.
 class ZT_API KvoSkipList : public KvoObject

@@ -14,8 +14,8 @@
 ///
 /// A walk is bound by the memory it waits for: a node, its object and whatever
 /// the object's key is. So a node's forwards lie right behind it, nodes lie
-/// close together in slabs, and the two nodes that can be asked next are
-/// fetched while the present one is compared.
+/// close together in slabs, and what can be asked next is fetched while the
+/// present object compares itself.
 
 namespace {
 

@@ -278,11 +278,14 @@ TEST(KvoList, LinkAtWalksFromTheNearerEnd)
     KvoList::Link* middle = list.LinkAt(2);
     KvoList::Link* fourth = list.LinkAt(3);
 
-    // With the list cut in the middle only the nearer way leads there.
+    // With the list cut on the longer way only the nearer one leads there; the
+    // middle is reached from the tail.
     middle->next = middle->prev = nullptr;
     KvoList::Link* from_head = list.LinkAt(1);
     KvoList::Link* from_tail = list.LinkAt(3);
+    second->next = nullptr;
     KvoList::Link* half_way = list.LinkAt(2);
+    second->next = fourth->prev = middle;
     middle->prev = second;
     middle->next = fourth;
 

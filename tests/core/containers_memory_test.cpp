@@ -280,6 +280,25 @@ TEST(ContainersWithoutMemory, SkipListDoesNotGrowLevelsForARefusedNode)
     EXPECT_EQ(ObjectsOf(list), (Objects{&object}));
 }
 
+TEST(ContainersWithoutMemory, RefusedNodeLeavesTheCursorBeforeItsPlace)
+{
+    FakeRandom dice;
+    Foremost object;
+    Number first(1), second(1), other(1);
+    KvoSkipList list, rest;
+    list.Insert(&first);
+    list.Insert(&second);
+    Stock(rest, &object);
+    {
+        NoMemory now;
+        FillUp(rest, &object);
+        list.Insert(&other);
+    }
+
+    EXPECT_EQ(ObjectsOf(list), (Objects{&first, &second}));
+    EXPECT_EQ(list.current->object, &second);
+}
+
 TEST(ContainersWithoutMemory, CopyOfASkipListEndsEarly)
 {
     FakeRandom dice;
