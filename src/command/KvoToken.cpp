@@ -20,6 +20,8 @@ KvoToken::KvoToken(const KvoToken& other)
 
 KvoToken& KvoToken::operator=(const KvoToken& other)
 {
+    if (this == &other)
+        return *this;
     KvoObject::operator=(other);
     quote = other.quote;
     table = other.table;
