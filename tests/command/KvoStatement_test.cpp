@@ -283,18 +283,40 @@ TEST(KvoStatement, AppendAddsAStatementBehindWhatItHolds)
     EXPECT_EQ(RestOf(in), "d\n");
 }
 
+// With much in view behind a statement it is read in another way, so these are
+// read with nothing and with something behind them.
 TEST(KvoStatement, AppendCleansWhatItHeldAsWell)
 {
-    std::istringstream in("b\n");
-    std::istringstream more("c d\n");
-    KvoStatement statement("#a");
-    KvoStatement continued("\n");
-    continued.AddArg("b");
+    for (const std::size_t behind : {0, 200}) {
+        std::istringstream in("b\n" + std::string(behind, '\n'));
+        std::istringstream more("c d\n" + std::string(behind, '\n'));
+        KvoStatement statement("#a");
+        KvoStatement continued("\n");
+        continued.AddArg("b");
 
-    statement.Append(in);
-    EXPECT_EQ(statement.Count(), 0);
-    continued.Append(more);
-    EXPECT_EQ(texts_of(continued), (Texts{"b", "c", "d"}));
+        statement.Append(in);
+        EXPECT_EQ(statement.Count(), 0);
+        continued.Append(more);
+        EXPECT_EQ(texts_of(continued), (Texts{"b", "c", "d"}));
+    }
+}
+
+TEST(KvoStatement, AppendCleansAgainWhatAPassHasPassedOver)
+{
+    for (const std::size_t behind : {0, 200}) {
+        std::istringstream in(";;b;" + std::string(behind, ';') + "c\n");
+        KvoStatement statement("a");
+        statement.AddArg("\n");
+        statement.AddArg("\n");
+
+        statement.Append(in);
+
+        EXPECT_EQ(texts_of(statement), (Texts{"a", "\n"}));
+        statement.Append(in);
+        EXPECT_EQ(texts_of(statement), (Texts{"a"}));
+        statement.Append(in);
+        EXPECT_EQ(texts_of(statement), (Texts{"a", "b"}));
+    }
 }
 
 TEST(KvoStatement, AppendReadsOnWhenCleaningLeavesAsManyWordsAsBefore)

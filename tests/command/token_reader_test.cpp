@@ -127,6 +127,23 @@ std::unique_ptr<std::istream> tied_stream(const std::string& text)
     return stream;
 }
 
+/// Fails whenever it is flushed.
+class BrokenOutput : public std::streambuf
+{
+protected:
+    int sync() override { return -1; }
+};
+
+std::unique_ptr<std::istream> stream_tied_to_broken(const std::string& text)
+{
+    static BrokenOutput buffer;
+    static std::ostream output(&buffer);
+    output.exceptions(std::ios::badbit);
+    auto stream = std::make_unique<std::istringstream>(text);
+    stream->tie(&output);
+    return stream;
+}
+
 const std::vector<Kind>& kinds()
 {
     static const std::vector<Kind> all = {
@@ -136,6 +153,7 @@ const std::vector<Kind>& kinds()
         {"file with a narrow buffer", narrow_file_stream},
         {"string told to throw", throwing_stream},
         {"string with a tied output", tied_stream},
+        {"string with a broken tied output", stream_tied_to_broken},
         {"one by one", odd<OneByOneBuffer>(true)},
         {"one by one, nothing taken back", odd<OneByOneBuffer>(false)},
         {"chunks of one", odd<ChunkBuffer>(std::size_t{1})},
