@@ -134,14 +134,25 @@ protected:
     int sync() override { return -1; }
 };
 
+/// Is tied to an output of its own, which throws when it is flushed.
+class StreamTiedToBroken : public std::istringstream
+{
+public:
+    explicit StreamTiedToBroken(const std::string& text)
+        : std::istringstream(text), output(&buffer)
+    {
+        output.exceptions(std::ios::badbit);
+        tie(&output);
+    }
+
+private:
+    BrokenOutput buffer;
+    std::ostream output;
+};
+
 std::unique_ptr<std::istream> stream_tied_to_broken(const std::string& text)
 {
-    static BrokenOutput buffer;
-    static std::ostream output(&buffer);
-    output.exceptions(std::ios::badbit);
-    auto stream = std::make_unique<std::istringstream>(text);
-    stream->tie(&output);
-    return stream;
+    return std::make_unique<StreamTiedToBroken>(text);
 }
 
 const std::vector<Kind>& kinds()
