@@ -330,6 +330,19 @@ TEST(KvoStatement, AppendReadsOnWhenCleaningLeavesAsManyWordsAsBefore)
     EXPECT_EQ(RestOf(in), "d\n");
 }
 
+TEST(KvoStatement, AppendReadsOnAndCleansAgainWhatItPassedOver)
+{
+    for (const std::size_t behind : {0, 200}) {
+        std::istringstream in("b;c;d;" + std::string(behind, ';'));
+        KvoStatement statement("\n");
+        statement.AddArg("\n");
+
+        statement.Append(in);
+
+        EXPECT_EQ(texts_of(statement), (Texts{"b", "c", "d"}));
+    }
+}
+
 TEST(KvoStatement, AppendOfAStreamAtItsEndReadsNothing)
 {
     std::istringstream in("a");
