@@ -19,24 +19,20 @@
 #include "support/TokenizerDifference.h"
 
 namespace {
-/// Texts of the language's own characters, words of all lengths and, now and
-/// then, any byte.
+/// Texts of words of all lengths, of the language's own characters, of them
+/// many or few, and now and then of any byte.
 class RandomText
 {
 public:
     std::string Of(std::size_t bytes)
     {
         static const std::string marks = " \n;!#\"'\\\t,/.:\v";
+        const unsigned calm = Number(3) * Number(20) + 1;
         std::string text;
         while (text.size() < bytes) {
-            const unsigned kind = dice() % 16;
-            if (kind < 7)
-                text += marks[dice() % marks.size()];
-            else if (kind < 14)
-                text += word(dice() % 9 + 1);
-            else if (kind == 14)
-                text += word(dice() % 90);
-            else
+            text += word(Number(8) == 0 ? Number(90) : Number(9) + 1);
+            text += Number(calm) ? ' ' : marks[dice() % marks.size()];
+            if (Number(calm * 16) == 0)
                 text += static_cast<char>(dice() % 256);
         }
         return text;

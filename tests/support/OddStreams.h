@@ -46,8 +46,8 @@ private:
     std::size_t next = 0;
 };
 
-/// Shows its text in chunks whose sizes go round from 1 to `largest`. Throws
-/// once it comes to the character `throws_at`.
+/// Shows its text in chunks whose sizes go down from `largest_chunk` to 1 and
+/// round again. Throws once it comes to the character `throws_at`.
 class ChunkBuffer : public std::streambuf
 {
 public:
@@ -63,7 +63,7 @@ protected:
             throw std::runtime_error("the device is gone");
         if (next == text.size())
             return traits_type::eof();
-        size = size % largest + 1;
+        size = size > 1 ? size - 1 : largest;
         const std::size_t bytes = std::min(size, text.size() - next);
         // A block of its own: what lies outside of it is nobody's business.
         chunk = std::make_unique<char[]>(bytes);
