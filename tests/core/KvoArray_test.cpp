@@ -74,35 +74,6 @@ TEST(KvoArray, ElementsOfNoSizeCountAsBytes)
     EXPECT_EQ(negative.size, 3);
 }
 
-TEST(KvoArray, TypedOnesHaveTheirElementsSize)
-{
-    EXPECT_EQ(KvoFloatArray().elementSize, 4);
-    EXPECT_EQ(KvoIntArray().elementSize, 4);
-    EXPECT_EQ(KvoCharArray().elementSize, 1);
-    EXPECT_EQ(KvoByteArray().elementSize, 1);
-    EXPECT_EQ(KvoStringArray().elementSize, static_cast<int>(sizeof(char*)));
-}
-
-TEST(KvoArray, TypedOnesKeepTheirElements)
-{
-    char text[] = "text";
-    KvoFloatArray floats(2);
-    KvoCharArray chars(2);
-    KvoByteArray bytes(2);
-    KvoStringArray texts(2);
-
-    floats[1] = 2.5f;
-    chars[1] = 'c';
-    bytes[1] = 255;
-    texts[1] = text;
-
-    EXPECT_EQ(floats[1], 2.5f);
-    EXPECT_EQ(chars[1], 'c');
-    EXPECT_EQ(bytes[1], 255);
-    EXPECT_EQ(texts[1], text);
-    EXPECT_EQ(texts[0], nullptr);
-}
-
 TEST(KvoArray, IsAnObjectWithoutClassInformationOfItsOwn)
 {
     KvoIntArray array(3);
@@ -112,17 +83,6 @@ TEST(KvoArray, IsAnObjectWithoutClassInformationOfItsOwn)
     EXPECT_STREQ(array.ClassName(), "KvoObject");
     EXPECT_STREQ(clone->ClassName(), "KvoObject");
     delete clone;
-}
-
-TEST(KvoArray, TextsOutliveTheArray)
-{
-    char text[] = "still here";
-    {
-        KvoStringArray array(1);
-        array[0] = text;
-    }
-
-    EXPECT_STREQ(text, "still here");
 }
 
 TEST(KvoArray, ElementPastTheEndGrowsTheArrayWithZeros)

@@ -67,4 +67,23 @@ inline std::vector<int> HeightsOf(const KvoSkipList& list)
     return heights;
 }
 
+/// Objects of 10, 20 and 30 in a list.
+struct Tens
+{
+    Tens()
+    {
+        for (Number* number : {&twenty, &ten, &thirty})
+            list.Insert(number);
+    }
+
+    Number ten{10}, twenty{20}, thirty{30};
+    KvoSkipList list;
+};
+
+/// Gives the object under the cursor, null also for the header.
+inline KvoObject* UnderCursor(const KvoSkipList& list)
+{
+    return list.current ? list.current->object : nullptr;
+}
+
 #endif
