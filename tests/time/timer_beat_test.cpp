@@ -545,6 +545,32 @@ TEST_F(ZtTimerBeatTest, AnAlarmDueDuringAFireByHandIsNotLost)
     EXPECT_EQ(ZtTimerBeat::Statistics().beats, 1);
 }
 
+TEST_F(ZtTimerBeatTest, AnAlarmThatACallbackLetsThroughIsLeftToItsOwnBeat)
+{
+    static int calls;
+    calls = 0;
+    ZtTimerBeat::start();
+    ZtTimer timer;
+    timer.post_repeat(
+        [](ZtTimer*, void*) {
+            ++calls;
+            sigset_t alarm_only;
+            sigemptyset(&alarm_only);
+            sigaddset(&alarm_only, SIGALRM);
+            pthread_sigmask(SIG_UNBLOCK, &alarm_only, nullptr);
+            raise(SIGALRM);
+        },
+        nullptr, 0);
+    timer.start();
+    Beats(1);
+
+    Beats(3);
+
+    EXPECT_EQ(calls, 3);
+    EXPECT_EQ(ZtTimerBeat::Statistics().beats, 4);
+    EXPECT_EQ(ZtTimerBeat::danger, 0);
+}
+
 TEST_F(ZtTimerBeatTest, TheWallClockIsReadByLoadOnly)
 {
     ZtTimerBeat::start();
