@@ -58,6 +58,18 @@ TEST(ProgressBar, IsTakenAwayBeforeSomethingElseIsWritten)
                              "\r\033[Ka report\nanother\nlater\n");
 }
 
+TEST(ProgressBar, StaysWhenNothingIsWritten)
+{
+    CapturedStderr errors;
+    ProgressBar bar(4, true);
+    bar.Show(0, 0);
+
+    std::cerr << "" << std::flush;
+    std::cout << std::string() << std::flush;
+
+    EXPECT_EQ(errors.Text(), "\r[..............................] 0/4\033[K");
+}
+
 TEST(ProgressBar, ShowsNothingWhenItIsNotVisible)
 {
     CapturedStderr errors;

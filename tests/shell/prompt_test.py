@@ -63,6 +63,15 @@ class Prompt(unittest.TestCase):
         terminal.type("Quit 5\r")
         self.assertEqual(terminal.end(), 5)
 
+    def test_the_end_may_be_typed_ahead(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("System echo running\\; sleep 0.2\r")
+        terminal.wait_for("\nrunning")
+        terminal.type("Echo too\r\x04")
+        terminal.wait_for("\ntoo")
+        self.assertEqual(terminal.end(), 0)
+
     def test_a_block_asks_on(self):
         terminal = self.start("--jobs", "1")
         terminal.wait_for("ztsh> ")
@@ -189,6 +198,15 @@ class Prompt(unittest.TestCase):
             terminal.wait_for("left\x1b[K")
             terminal.wait_for("\r\x1b[Kdone 0003\r\n")
             self.assertEqual(terminal.end(), 0)
+
+    def test_the_line_of_a_silent_sequence_stays(self):
+        for jobs in ("1", "2"):
+            terminal = self.start("--jobs", jobs, "-c", "Frames 1 5 begin; "
+                                  "System sleep 0.15; end")
+            terminal.wait_for("0/5")
+            self.assertEqual(terminal.end(), 0)
+            self.assertEqual(terminal.seen.count("\r\x1b[K"), 1)
+            self.assertTrue(terminal.seen.endswith("\r\x1b[K"))
 
 
 if __name__ == "__main__":

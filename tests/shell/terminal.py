@@ -5,6 +5,7 @@ import fcntl
 import os
 import pty
 import select
+import signal
 import struct
 import termios
 import time
@@ -57,6 +58,10 @@ class Terminal:
         deadline = time.monotonic() + SECONDS
         while self.read_some(max(0, deadline - time.monotonic())):
             pass
+        if time.monotonic() >= deadline:
+            os.kill(self.pid, signal.SIGKILL)
         _, status = os.waitpid(self.pid, 0)
         os.close(self.master)
+        if time.monotonic() >= deadline:
+            raise AssertionError(f"no end; seen so far:\n{self.seen!r}")
         return os.waitstatus_to_exitcode(status)

@@ -125,13 +125,20 @@ class WaysIn(unittest.TestCase):
 
     def test_scripts_within_each_other_until_there_are_no_more_files(self):
         (self.directory / "deep.zt").write_text("Include deep.zt\n")
+        # The missing file comes first so that whatever a sanitizer has to look
+        # at for the first time is looked at while it can open files itself.
+        (self.directory / "a.zt").write_text(
+            "Include empty.zt\nInclude nofile\nInclude deep.zt\n")
+        (self.directory / "empty.zt").write_text("")
 
         def few_files():
             resource.setrlimit(resource.RLIMIT_NOFILE, (30, 30))
 
-        done = self.run_it([SHELL, "deep.zt"], preexec_fn=few_files)
+        done = self.run_it([SHELL, "a.zt"], preexec_fn=few_files)
         self.assertEqual(
-            done.stderr, "Error - ZtDispatcher: Cannot open file deep.zt\n"
+            done.stderr, "Error - ZtDispatcher: Cannot open file nofile\n"
+            "    at a.zt:2\n"
+            "Error - ZtDispatcher: Cannot open file deep.zt\n"
             "    at deep.zt:1\n")
         self.assertEqual(done.returncode, 3)
 

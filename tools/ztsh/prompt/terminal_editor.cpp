@@ -81,7 +81,8 @@ TerminalEditor::TerminalEditor(const std::string& history_path,
     el_set(edit, EL_SIGNAL, 0);
     el_set(edit, EL_EDITOR, "emacs");
     el_set(edit, EL_GETCFN, read_character);
-    el_set(edit, EL_ADDFN, "zt-complete", "Complete the word", complete);
+    // The narrow form of this call never frees its copies of the texts.
+    el_wset(edit, EL_ADDFN, L"zt-complete", L"Complete the word", complete);
     el_set(edit, EL_BIND, "^I", "zt-complete", nullptr);
     el_set(edit, EL_BIND, "^R", "em-inc-search-prev", nullptr);
     HistEvent event;
@@ -103,6 +104,9 @@ Typed TerminalEditor::Ask(const std::string& prompt, std::string& line)
 {
     WindowWatch watch;
     prompt_text = prompt;
+    // Before the prompt is to be seen: the editor would do it only after, and
+    // who answers at once would answer a terminal in its ordinary mode.
+    el_set(edit, EL_PREP_TERM, 1);
     int length = 0;
     const char* typed = el_gets(edit, &length);
     if (StopSignal() != 0) {
@@ -152,6 +156,11 @@ int TerminalEditor::read_character(EditLine* editor, wchar_t* character)
         }
         if (got <= 0)
             return static_cast<int>(got);
+        // The key that ends the input comes like this if it was struck while
+        // a statement ran and the terminal was in its ordinary mode.
+        constexpr char end_of_input = '\004';
+        if (byte == '\0')
+            byte = end_of_input;
         constexpr std::size_t wrong = static_cast<std::size_t>(-1);
         constexpr std::size_t incomplete = static_cast<std::size_t>(-2);
         std::size_t length = std::mbrtowc(character, &byte, 1, &state);

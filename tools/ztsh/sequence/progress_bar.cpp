@@ -128,7 +128,8 @@ ProgressBar::Guard::int_type ProgressBar::Guard::overflow(int_type character)
 
 std::streamsize ProgressBar::Guard::xsputn(const char* text, std::streamsize n)
 {
-    bar.Hide();
+    if (n > 0)
+        bar.Hide();
     return former->sputn(text, n);
 }
 
