@@ -3,6 +3,7 @@
 #include "system/terminal.h"
 
 #include <algorithm>
+#include <cmath>
 #include <cstdio>
 #include <iostream>
 
@@ -15,7 +16,7 @@ constexpr int errors_descriptor = 2;
 std::string text_of_seconds(double seconds)
 {
     constexpr double longest = 359999;
-    long whole = static_cast<long>(std::clamp(seconds, 0.0, longest) + 0.5);
+    long whole = std::lround(std::clamp(seconds, 0.0, longest));
     char text[32];
     if (whole >= 3600)
         std::snprintf(text, sizeof text, "%ld:%02ld:%02ld", whole / 3600,
