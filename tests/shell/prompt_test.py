@@ -21,9 +21,9 @@ class Prompt(unittest.TestCase):
         self.directory = pathlib.Path(self.holder.name).resolve()
         self.addCleanup(self.holder.cleanup)
 
-    def start(self, *arguments, rows=24, columns=80):
+    def start(self, *arguments, rows=24, columns=80, kind="xterm"):
         environment = {"XDG_STATE_HOME": str(self.directory / "state"),
-                       "HOME": str(self.directory), "TERM": "xterm",
+                       "HOME": str(self.directory), "TERM": kind,
                        "LC_ALL": "C.UTF-8"}
         return Terminal([SHELL, *arguments], self.directory, environment, rows,
                         columns)
@@ -207,6 +207,26 @@ class Prompt(unittest.TestCase):
             self.assertEqual(terminal.end(), 0)
             self.assertEqual(terminal.seen.count("\r\x1b[K"), 1)
             self.assertTrue(terminal.seen.endswith("\r\x1b[K"))
+
+    def test_a_plain_terminal_shows_no_line(self):
+        terminal = self.start("-c", "Frames 1 3 begin; Echo $frame; end",
+                              kind="dumb")
+        self.assertEqual(terminal.end(), 0)
+        self.assertEqual(terminal.seen, "0001\r\n0002\r\n0003\r\n")
+
+    def test_standard_input_is_read_from_the_terminal(self):
+        terminal = self.start()
+        terminal.wait_for("ztsh> ")
+        terminal.type("Include -\r")
+        terminal.wait_for("Include -\r\n")
+        terminal.type("Echo in\r")
+        terminal.wait_for("\nin\r\n")
+        terminal.type("\x04")
+        terminal.wait_for("ztsh> ")
+        terminal.type("Echo out\r")
+        terminal.wait_for("\nout\r\n")
+        terminal.type("\x04")
+        self.assertEqual(terminal.end(), 0)
 
 
 if __name__ == "__main__":

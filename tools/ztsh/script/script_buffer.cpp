@@ -68,8 +68,11 @@ ScriptBuffer::int_type ScriptBuffer::underflow()
     char last = egptr() > eback() ? egptr()[-1] : '\0';
 
     std::size_t bytes = read_more();
-    if (bytes == 0)
+    if (bytes == 0) {
+        // The end is final; a terminal would give more if it were asked again.
+        descriptor = -1;
         return traits_type::eof();
+    }
     lines_before = lines;
     block[0] = last;
     show_block(bytes);

@@ -1,5 +1,7 @@
 #include "system/terminal.h"
 
+#include <cstdlib>
+#include <cstring>
 #include <sys/ioctl.h>
 #include <unistd.h>
 
@@ -8,6 +10,13 @@ namespace ztsh {
 bool IsTerminal(int descriptor)
 {
     return isatty(descriptor) == 1;
+}
+
+bool CanRedraw(int descriptor)
+{
+    const char* kind = std::getenv("TERM");
+    return IsTerminal(descriptor) && kind && *kind != '\0' &&
+           std::strcmp(kind, "dumb") != 0;
 }
 
 WindowSize SizeOfWindow(int descriptor)

@@ -16,6 +16,10 @@ struct WindowSize
 /// Tells whether the file descriptor is a terminal.
 bool IsTerminal(int descriptor);
 
+/// Tells whether the file descriptor is a terminal that can take back what it
+/// shows.
+bool CanRedraw(int descriptor);
+
 /// Gives the window's size; 80 by 24 for one that does not say.
 WindowSize SizeOfWindow(int descriptor);
 

@@ -111,7 +111,7 @@ void SequenceWords::skip_block()
 
 void SequenceWords::run(const FrameRange& range, const Block& block)
 {
-    bool show = depth == 0 && IsTerminal(errors_descriptor);
+    bool show = depth == 0 && CanRedraw(errors_descriptor);
     Tally tally(range.Count(), show);
     if (runner.settings.jobs > 1 && tally.count > 1 && depth == 0)
         run_in_workers(range, block, tally);
