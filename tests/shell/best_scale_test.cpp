@@ -47,6 +47,18 @@ TEST(ScaleBest, GivesTheOtherThreeChannelsAsResizeBestDoes)
         EXPECT_EQ(image.pixels[i] & 0x00FFFFFF, expected.pixels[i]) << i;
 }
 
+TEST(ScaleBest, KeepsAnOpaquePictureOpaque)
+{
+    ZtImageSGI image(5, 5, nullptr);
+    for (int i = 0; i < 25; ++i)
+        image.pixels[i] = static_cast<ZtPixel>(i * 7919) << 8 | 0xFF;
+
+    EXPECT_TRUE(ScaleBest(image, 7, 3));
+
+    for (int i = 0; i < 21; ++i)
+        EXPECT_EQ(ChannelOf(image.pixels[i], 3), 0xFF) << i;
+}
+
 TEST(ScaleBest, TreatsRedAsItTreatsGreen)
 {
     ZtImageSGI image(9, 9, nullptr);

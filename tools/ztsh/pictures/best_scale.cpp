@@ -1,10 +1,13 @@
 #include "pictures/best_scale.h"
 
+#include "pictures/opaque.h"
+
 namespace ztsh {
 
 bool ScaleBest(ZtImageSGI& image, int width, int height)
 {
     constexpr int red_shift = 24;
+    ZtPixel alpha = IsOpaque(image) ? opaque_alpha : 0;
     ZtImageSGI reds(image);
     if (!reds.pixels)
         return false;
@@ -22,7 +25,7 @@ bool ScaleBest(ZtImageSGI& image, int width, int height)
     std::size_t after =
         static_cast<std::size_t>(width) * static_cast<std::size_t>(height);
     for (std::size_t i = 0; i < after; ++i)
-        image.pixels[i] |= reds.pixels[i] << red_shift;
+        image.pixels[i] |= reds.pixels[i] << red_shift | alpha;
     return true;
 }
 

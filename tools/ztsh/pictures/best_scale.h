@@ -12,7 +12,8 @@ namespace ztsh {
 ///
 /// `ZtImageSGI::ResizeBest` averages three of the four channels and clears
 /// red. So it runs twice, the second time on a copy whose red stands where
-/// alpha was, and the two results are put together.
+/// alpha was, and the two results are put together. Its averages may come out
+/// one too low; a picture that was opaque is opaque all the same.
 ///
 /// Units:   sizes in pixels, at least 1.
 /// Returns: whether there was memory enough; if not the picture is as before.

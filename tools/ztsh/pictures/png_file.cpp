@@ -1,8 +1,8 @@
 #include "pictures/png_file.h"
 
+#include "pictures/opaque.h"
 #include "system/files.h"
 
-#include <algorithm>
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
@@ -13,17 +13,6 @@
 namespace ztsh {
 
 namespace {
-
-constexpr ZtPixel alpha_mask = 0xFF;
-
-bool is_opaque(const ZtImageSGI& image)
-{
-    std::size_t pixels = static_cast<std::size_t>(image.width) *
-                         static_cast<std::size_t>(image.height);
-    return std::all_of(image.pixels, image.pixels + pixels, [](ZtPixel pixel) {
-        return (pixel & alpha_mask) == alpha_mask;
-    });
-}
 
 /// The picture's bytes in PNG's order: top row first, red, green, blue and
 /// with `channels` 4 alpha.
@@ -47,7 +36,7 @@ std::vector<png_byte> bytes_of(const ZtImageSGI& image, int channels)
 /// Writes the bytes to an open file.
 std::string write_to(std::FILE* file, const ZtImageSGI& image)
 {
-    int channels = is_opaque(image) ? 3 : 4;
+    int channels = IsOpaque(image) ? 3 : 4;
     std::vector<png_byte> bytes = bytes_of(image, channels);
     png_image header = {};
     header.version = PNG_IMAGE_VERSION;
