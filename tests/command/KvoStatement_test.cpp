@@ -287,7 +287,7 @@ TEST(KvoStatement, AppendAddsAStatementBehindWhatItHolds)
 // read with nothing and with something behind them.
 TEST(KvoStatement, AppendCleansWhatItHeldAsWell)
 {
-    for (const std::size_t behind : {0, 200}) {
+    for (const std::size_t behind : {0u, 200u}) {
         std::istringstream in("b\n" + std::string(behind, '\n'));
         std::istringstream more("c d\n" + std::string(behind, '\n'));
         KvoStatement statement("#a");
@@ -303,7 +303,7 @@ TEST(KvoStatement, AppendCleansWhatItHeldAsWell)
 
 TEST(KvoStatement, AppendCleansAgainWhatAPassHasPassedOver)
 {
-    for (const std::size_t behind : {0, 200}) {
+    for (const std::size_t behind : {0u, 200u}) {
         std::istringstream in(";;b;" + std::string(behind, ';') + "c\n");
         KvoStatement statement("a");
         statement.AddArg("\n");
@@ -332,7 +332,7 @@ TEST(KvoStatement, AppendReadsOnWhenCleaningLeavesAsManyWordsAsBefore)
 
 TEST(KvoStatement, AppendReadsOnAndCleansAgainWhatItPassedOver)
 {
-    for (const std::size_t behind : {0, 200}) {
+    for (const std::size_t behind : {0u, 200u}) {
         std::istringstream in("b;c;d;" + std::string(behind, ';'));
         KvoStatement statement("\n");
         statement.AddArg("\n");
