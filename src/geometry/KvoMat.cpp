@@ -5,6 +5,8 @@
 #include "KVO/KvoVec.h"
 #include "ZT/error.h"
 
+#include "platform/point_lanes.h"
+
 using zt_geometry::LaneRows;
 using zt_geometry::Lanes;
 
@@ -101,6 +103,24 @@ KvoMat KvoMat::Invert() const
         return transposed(c);
     }
     return transposed({c.row0 / det, c.row1 / det, c.row2 / det, c.row3 / det});
+}
+
+void KvoMat::Transform(const KvoVec4* points, KvoVec4* results,
+                       std::size_t count) const
+{
+    if (count == 0)
+        return;
+    const KvoMat m(*this); // which may be among the results
+    zt_platform::PointLanes::current().transform(&points->x, &results->x, count,
+                                                 &m.rows[0].x);
+}
+
+void KvoMat::Transform(const KvoVec3* points, KvoVec3* results,
+                       std::size_t count) const
+{
+    const KvoMat m(*this); // which may be among the results
+    for (std::size_t i = 0; i < count; ++i)
+        results[i] = KvoVec3(KvoVec4(points[i]) * m);
 }
 
 std::ostream& operator<<(std::ostream& stream, const KvoMat& m)

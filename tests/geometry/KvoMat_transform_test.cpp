@@ -7,10 +7,9 @@
 #include "KVO/KvoVec.h"
 #include "geometry/components.h"
 #include "geometry/literal.h"
-#include "geometry/points.h"
 #include "geometry/reference.h"
 #include "geometry/samples.h"
-#include "support/ErrorTrap.h"
+#include "platform/point_lanes.h"
 
 namespace {
 constexpr float infinity = std::numeric_limits<float>::infinity();
@@ -202,44 +201,28 @@ TEST(KvoMat, TransformGivesEachPointTimesTheMatrix)
     }
 }
 
-TEST(KvoMat, BothWaysOfTransformingHaveTheBitsOfTheLiteralFormula)
+TEST(KvoMat, TransformHasTheBitsOfTheLiteralFormulaInWhateverLanes)
 {
-    const std::vector<KvoVec4> points = AnyPoints(1000);
-    Samples samples;
-    for (int round = 0; round < 60; ++round) {
-        const KvoMat m = round % 3 == 0   ? samples.Mat()
-                         : round % 3 == 1 ? samples.AnyMat()
-                                          : depth_to_w;
-        std::vector<KvoVec4> one_by_one(points.size());
-        std::vector<KvoVec4> pairs(points.size());
+    using zt_platform::PointLanes;
+    const std::vector<KvoVec4> points = AnyPoints(1001);
+    for (const PointLanes* lanes :
+         {&PointLanes::plain(), &PointLanes::fastest()}) {
+        Samples samples;
+        PointLanes::install(lanes);
+        for (int round = 0; round < 60; ++round) {
+            const KvoMat m = round % 3 == 0   ? samples.Mat()
+                             : round % 3 == 1 ? samples.AnyMat()
+                                              : depth_to_w;
+            std::vector<KvoVec4> results(points.size());
 
-        zt_geometry::transform_one_by_one(points.data(), one_by_one.data(),
-                                          points.size(), m);
-        const std::size_t done = zt_geometry::transform_in_pairs(
-            points.data(), pairs.data(), points.size(), m);
+            m.Transform(points.data(), results.data(), points.size());
 
-        EXPECT_TRUE(done == points.size() || done == 0);
-        for (std::size_t i = 0; i < points.size(); ++i) {
-            const KvoVec4 want = literal::row_times(points[i], m);
-            ASSERT_TRUE(SameBits(one_by_one[i], want)) << points[i] << m;
-            ASSERT_TRUE(i >= done || SameBits(pairs[i], want))
-                << points[i] << m;
+            for (std::size_t i = 0; i < points.size(); ++i)
+                EXPECT_TRUE(
+                    SameBits(results[i], literal::row_times(points[i], m)))
+                    << lanes->name() << points[i] << m;
         }
-    }
-}
-
-TEST(KvoMat, TransformInPairsLeavesAtMostThreePoints)
-{
-    const std::vector<KvoVec4> points = AnyPoints(64);
-    const std::size_t all = zt_geometry::transform_in_pairs(
-        points.data(), std::vector<KvoVec4>(64).data(), 64, KvoMat());
-    for (std::size_t count = 0; count < 64; ++count) {
-        std::vector<KvoVec4> results(count);
-
-        const std::size_t done = zt_geometry::transform_in_pairs(
-            points.data(), results.data(), count, KvoMat());
-
-        EXPECT_EQ(done, all == 0 ? 0 : count - count % 4);
+        PointLanes::install(nullptr);
     }
 }
 
