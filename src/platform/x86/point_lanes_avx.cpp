@@ -53,7 +53,7 @@ public:
                                           const float* matrix) const override
     {
         Rows rows;
-        for (int i = 0; i < 4; ++i)
+        for (std::size_t i = 0; i < 4; ++i)
             rows.row[i] = _mm256_broadcast_ps(
                 reinterpret_cast<const __m128*>(matrix + 4 * i));
         std::size_t at = 0;
