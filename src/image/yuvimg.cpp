@@ -12,7 +12,7 @@ namespace {
 
 constexpr int frame_width = 720;
 constexpr int frame_height = 486;
-constexpr std::size_t line_bytes = frame_width * 2;
+constexpr std::size_t line_bytes = std::size_t{frame_width} * 2;
 constexpr std::size_t frame_bytes = line_bytes * frame_height;
 
 constexpr int luma_offset = 16;
@@ -58,7 +58,7 @@ constexpr ZtPixel decode_pixel(ChannelOrder order, int luma, int chroma1,
 template <ChannelOrder order>
 void decode_line(const unsigned char* raw, ZtPixel* pixels)
 {
-    for (int group = 0; group < frame_width / 2; ++group) {
+    for (std::size_t group = 0; group < frame_width / 2; ++group) {
         const unsigned char* of = raw + 4 * group;
         pixels[2 * group] = decode_pixel(order, of[1], of[0], of[2]);
         pixels[2 * group + 1] = decode_pixel(order, of[3], of[0], of[2]);

@@ -28,7 +28,7 @@ const int* ColumnMap::columns(int source_width, int width)
 {
     if (entries && from == source_width && to == width)
         return entries;
-    if (width > capacity) {
+    if (!entries || width > capacity) {
         void* larger = std::realloc(entries, static_cast<std::size_t>(width) *
                                                  sizeof *entries);
         if (!larger)

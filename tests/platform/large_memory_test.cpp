@@ -10,6 +10,8 @@
 
 #include <gtest/gtest.h>
 
+#include "support/FailingMalloc.h"
+
 namespace {
 
 using zt_platform::new_large_block;
@@ -44,9 +46,15 @@ TEST(large_memory, ABlockOfAnySizeCanBeFilledAndReleased)
     }
 }
 
-TEST(large_memory, MoreThanThereIsIsNull)
+TEST(large_memory, WithoutMemoryThereIsNone)
 {
-    EXPECT_EQ(new_large_block(SIZE_MAX / 2 + 1), nullptr);
+    FailingMalloc none(0);
+
+    void* small = new_large_block(1);
+    void* large = new_large_block(std::size_t{9} << 20);
+
+    EXPECT_EQ(small, nullptr);
+    EXPECT_EQ(large, nullptr);
 }
 
 TEST(large_memory, ALargeBlockAsksForLargePagesWhereTheSystemHasThem)

@@ -55,10 +55,12 @@ TEST_P(PixelLanesTest, WordsAreMadeOfBytesTheLowestFirst)
             {rows[0].data(), rows[1].data(), rows[2].data(), rows[3].data()},
             words.data(), count);
 
-        for (std::size_t i = 0; i < count; ++i)
-            ASSERT_EQ(words[i], rows[0][i] + (rows[1][i] << 8) +
-                                    (rows[2][i] << 16) +
-                                    (std::uint32_t{rows[3][i]} << 24));
+        for (std::size_t i = 0; i < count; ++i) {
+            std::uint32_t expected = 0;
+            for (std::size_t lane = 0; lane < 4; ++lane)
+                expected += std::uint32_t{rows[lane][i]} << 8 * lane;
+            ASSERT_EQ(words[i], expected);
+        }
         ASSERT_EQ(words[count], 0x01234567u);
     }
 }

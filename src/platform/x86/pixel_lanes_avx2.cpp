@@ -107,7 +107,7 @@ struct Columns
 /// Pixels that are averaged together, and registers for their values: three a
 /// pixel, four in a register.
 constexpr std::size_t averaged_pixels = 8;
-constexpr int averaged_registers = 6;
+constexpr std::size_t averaged_registers = 6;
 
 struct Values
 {
@@ -136,7 +136,7 @@ struct Values
     const __m256i third =
         _mm256_setr_epi64x(none | 10, none | 12, none | 13, none | 14);
     Values values;
-    for (int half = 0; half < 2; ++half) {
+    for (std::size_t half = 0; half < 2; ++half) {
         __m256i twice = _mm256_broadcastsi128_si256(_mm_loadu_si128(
             reinterpret_cast<const __m128i*>(pixels + 4 * half)));
         values.quarter[3 * half] = number_of(twice, first);
@@ -152,7 +152,7 @@ struct Values
 {
     const __m128i spread =
         _mm_setr_epi8(0, 1, 2, -1, 3, 4, 5, -1, 6, 7, 8, -1, 9, 10, 11, -1);
-    for (int half = 0; half < 2; ++half) {
+    for (std::size_t half = 0; half < 2; ++half) {
         const __m256d* quarter = values.quarter + 3 * half;
         __m128i first = _mm_packs_epi32(_mm256_cvttpd_epi32(quarter[0]),
                                         _mm256_cvttpd_epi32(quarter[1]));
@@ -172,7 +172,7 @@ struct Values
 
 [[gnu::target("avx2")]] Values sum_of(Values left, const Values& right)
 {
-    for (int i = 0; i < averaged_registers; ++i)
+    for (std::size_t i = 0; i < averaged_registers; ++i)
         left.quarter[i] = _mm256_add_pd(left.quarter[i], right.quarter[i]);
     return left;
 }
