@@ -158,7 +158,7 @@ bool write_sgi(const ZtPixel* pixels, int xsize, int ysize, int zsize,
         sound = write_row(writer, pixels + y * width, order, zsize, height, y,
                           rows);
     std::free(values);
-    return writer.finish() && sound;
+    return sound && writer.finish();
 }
 
 } // namespace zt_image

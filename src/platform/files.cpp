@@ -57,6 +57,7 @@ OutputFile::~OutputFile()
 bool OutputFile::write_at(std::uint64_t offset, const void* from,
                           std::size_t count)
 {
+    sound = sound && is_open();
     std::size_t done = 0;
     while (sound && done < count) {
         std::ptrdiff_t went = Files::current().write_at(

@@ -208,6 +208,7 @@ TEST(OutputFile, WhatCannotBeMadeIsNotOpen)
     EXPECT_FALSE(OutputFile(directory.Path("").c_str()).is_open());
     OutputFile nowhere(nullptr);
     EXPECT_FALSE(nowhere.is_open());
+    EXPECT_FALSE(nowhere.write_at(0, "0", 1));
     EXPECT_FALSE(nowhere.close());
 }
 
