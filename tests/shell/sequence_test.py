@@ -5,6 +5,7 @@ Usage: sequence_test.py SHELL TREE
 
 import os
 import pathlib
+import resource
 import subprocess
 import sys
 import tempfile
@@ -86,6 +87,24 @@ class Sequences(unittest.TestCase):
             self.assertIn("12 of 12 frames failed: 0001, 0002, 0003, 0004, "
                           "0005, 0006, 0007, 0008, 0009, 0010, ...\n",
                           done.stderr)
+
+    def test_workers_that_cannot_be_started_are_failed_frames(self):
+        (self.directory / "b.zt").write_text(
+            "Frames 1 2 begin; Echo no; end\nEcho on\n")
+
+        def few_files():
+            resource.setrlimit(resource.RLIMIT_NOFILE, (8, 8))
+
+        done = subprocess.run([SHELL, "--jobs", "2", "b.zt"],
+                              cwd=self.directory, text=True,
+                              capture_output=True, timeout=SECONDS,
+                              check=False, preexec_fn=few_files)
+        self.assertEqual(done.returncode, 1)
+        self.assertEqual(done.stderr, "".join(
+            f"Error: Frame {frame} failed: no worker could be started: Too "
+            "many open files\n    at b.zt:1\n" for frame in ("0001", "0002"))
+            + "Error: Frames: 2 of 2 frames failed: 0001, 0002\n"
+            "    at b.zt:1\non\n")
 
 
 if __name__ == "__main__":
