@@ -124,9 +124,10 @@ std::size_t useful_bytes(const Reading& reading, const SgiRowTable& table,
     std::uint64_t start = table.start(y, z);
     std::uint64_t held =
         reading.file.size() > start ? reading.file.size() - start : 0;
-    return std::min({static_cast<std::uint64_t>(table.length(y, z)),
-                     static_cast<std::uint64_t>(most_packet_bytes(pixels)),
-                     held + 128});
+    std::uint64_t useful =
+        std::min<std::uint64_t>(most_packet_bytes(pixels), held + 128);
+    return static_cast<std::size_t>(
+        std::min<std::uint64_t>(useful, table.length(y, z)));
 }
 
 /// Reads rows of any kind.

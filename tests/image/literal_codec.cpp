@@ -14,7 +14,9 @@ public:
 
     std::uint32_t Byte(std::uint64_t at) const
     {
-        return at < bytes.size() ? static_cast<unsigned char>(bytes[at]) : 0;
+        return at < bytes.size() ? static_cast<unsigned char>(
+                                       bytes[static_cast<std::size_t>(at)])
+                                 : 0;
     }
     std::uint32_t Short(std::uint64_t at) const
     {
