@@ -145,10 +145,10 @@ class Hostile(unittest.TestCase):
         self.directory = pathlib.Path(self.holder.name)
         self.addCleanup(self.holder.cleanup)
 
-    def give(self, name, kind, data):
+    def give(self, name, kind, data, script=SCRIPT):
         (self.directory / "picture").write_bytes(data)
         (self.directory / "a.zt").write_text(
-            SCRIPT.format(file="picture", kind=kind))
+            script.format(file="picture", kind=kind))
         with open(self.directory / "errors", "w+", encoding="utf-8") as errors:
             shell = subprocess.Popen([SHELL, "a.zt"], cwd=self.directory,
                                      stdin=subprocess.DEVNULL,
@@ -181,6 +181,11 @@ class Hostile(unittest.TestCase):
         self.assertEqual(refused, {
             "too_wide", "no_width", "too_high", "eight_bits", "header_short",
             "packet_cut"})
+
+    def test_a_picture_that_its_file_only_promises(self):
+        code = self.give("largest_header_alone", "pix", pix(8192, 8192, 24),
+                         "Load p {file} {kind}\nInfo p\nEcho on\n")
+        self.assertEqual(code, 0)
 
     def test_video_frames(self):
         refused = {name for name, data in YUV.items()

@@ -79,9 +79,11 @@ std::shared_ptr<Picture> LoadPicture(const std::string& name, PictureKind kind,
         return nullptr;
     PictureKind meant = kind == Auto ? kind_by_name(name) : kind;
     overlong_row_seen = false;
-    auto picture = std::make_shared<Picture>(
-        Picture{ZtImageSGI(name.c_str(), meant),
-                name + " (" + kind_words[meant] + ")"});
+    // Loaded in place: copying would touch all the memory of a picture whose
+    // file holds little but a header.
+    std::shared_ptr<Picture> picture(
+        new Picture{ZtImageSGI(name.c_str(), meant),
+                    name + " (" + kind_words[meant] + ")"});
     if (picture->image.pixels)
         return picture;
     why = why_not_loaded(meant, kind == Auto);
