@@ -10,47 +10,22 @@
 #include <bit>
 #include <cstdint>
 
-#if defined(__SSE2__)
-#include <emmintrin.h>
-#endif
+#include "platform/byte_chunk.h"
 
 namespace zt_command {
-constexpr int chunk_bytes = 16;
+using zt_platform::chunk_bytes;
 constexpr int block_bytes = 64;
 constexpr int stop_count = 4;
 
 /// The stops, each filling a chunk of its own.
-using Stops = char[stop_count][chunk_bytes];
+using Stops = zt_platform::ByteChunks<stop_count>;
 
 /// Gives a bit for each of the sixteen characters at `from` that ends a run,
 /// the lowest for the first.
 inline std::uint32_t ends_in_chunk(const char* from, const Stops& stops)
 {
-#if defined(__SSE2__)
-    const auto load = [](const char* chunk) {
-        return _mm_loadu_si128(reinterpret_cast<const __m128i*>(chunk));
-    };
-    const __m128i chunk = load(from);
-    // At most a space, unsigned: the smaller of the two is the character.
-    __m128i ends =
-        _mm_cmpeq_epi8(_mm_min_epu8(chunk, _mm_set1_epi8(' ')), chunk);
-    for (const char fixed : {'"', '\'', '\\'})
-        ends = _mm_or_si128(ends, _mm_cmpeq_epi8(chunk, _mm_set1_epi8(fixed)));
-    for (const auto& stop : stops)
-        ends = _mm_or_si128(ends, _mm_cmpeq_epi8(chunk, load(stop)));
-    return static_cast<std::uint32_t>(_mm_movemask_epi8(ends));
-#else
-    std::uint32_t ends = 0;
-    for (int i = 0; i < chunk_bytes; ++i) {
-        const char c = from[i];
-        bool end = static_cast<unsigned char>(c) <= ' ' || c == '"' ||
-                   c == '\'' || c == '\\';
-        for (const auto& stop : stops)
-            end = end || c == stop[0];
-        ends |= std::uint32_t{end} << i;
-    }
-    return ends;
-#endif
+    constexpr char quotes[] = {'"', '\'', '\\'};
+    return zt_platform::find_in_chunk(from, ' ', quotes, stops);
 }
 
 /// Does the same for the sixty-four characters at `from`.
