@@ -4,7 +4,7 @@
 #include <cstring>
 
 #include "command/token_reader.h"
-#include "command/write_text.h"
+#include "core/write_text.h"
 
 KvoToken::KvoToken(const char* special_characters)
     : quote(0), table(action_table(special_characters)), text(room), length(0),
@@ -53,7 +53,7 @@ void KvoToken::Read(std::istream& in)
 
 void KvoToken::Write(std::ostream& out)
 {
-    zt_command::write_text(out, text);
+    zt_core::write_text(out, text);
 }
 
 void KvoToken::WriteQuoted(std::ostream& out)
@@ -62,10 +62,10 @@ void KvoToken::WriteQuoted(std::ostream& out)
         if (table->ActionOf(*c) & ActionTable::Blank)
             quote = '"';
     if (quote)
-        zt_command::write_character(out, quote);
+        zt_core::write_character(out, quote);
     Write(out);
     if (quote && quote != '\\')
-        zt_command::write_character(out, quote);
+        zt_core::write_character(out, quote);
 }
 
 const char* KvoToken::Blanks()

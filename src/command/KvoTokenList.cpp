@@ -7,8 +7,8 @@
 #include <new>
 
 #include "command/token_reader.h"
-#include "command/write_text.h"
 #include "core/number_text.h"
+#include "core/write_text.h"
 
 namespace {
 // What an emptied list keeps for its next statement: this many tokens, and of
@@ -41,7 +41,7 @@ KvoTokenList::KvoTokenList(const char* special_characters,
 
 KvoTokenList::KvoTokenList(const KvoTokenList& other)
     : KvoObject(other), model(other.model), tokens(), count(0),
-      end(KvoNewString(other.end))
+      long_texts(false), end(KvoNewString(other.end))
 {
     copy_tokens(other);
 }
@@ -86,7 +86,7 @@ void KvoTokenList::Write(std::ostream& out)
 {
     for (int i = 0; i < count; ++i) {
         if (i > 0)
-            zt_command::write_character(out, ' ');
+            zt_core::write_character(out, ' ');
         token_at(i)->Write(out);
     }
 }
@@ -95,7 +95,7 @@ void KvoTokenList::WriteQuoted(std::ostream& out)
 {
     for (int i = 0; i < count; ++i) {
         if (i > 0)
-            zt_command::write_character(out, ' ');
+            zt_core::write_character(out, ' ');
         token_at(i)->WriteQuoted(out);
     }
 }

@@ -5,15 +5,15 @@
 #include "ZT/error.h"
 #include "command/directive_index.h"
 #include "command/fold_case.h"
-#include "command/write_text.h"
 #include "core/number_text.h"
+#include "core/write_text.h"
 
 namespace {
 void write_indented(std::ostream& out, const char* name)
 {
-    zt_command::write_text(out, "    ");
-    zt_command::write_text(out, name ? name : "");
-    zt_command::write_text(out, "\n");
+    zt_core::write_text(out, "    ");
+    zt_core::write_text(out, name ? name : "");
+    zt_core::write_text(out, "\n");
 }
 } // namespace
 

@@ -4,6 +4,8 @@
 #include <cstring>
 #include <new>
 
+#include "core/write_text.h"
+
 namespace {
 /// The records that lie between a walk's start and the one in hand. A record
 /// that is met again below itself has nothing new to say, so that a circle of
@@ -184,5 +186,5 @@ void KvoNamedObject::Read(std::istream&) {}
 
 void KvoNamedObject::Write(std::ostream& out)
 {
-    out << name;
+    zt_core::write_text(out, name);
 }

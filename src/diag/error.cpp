@@ -8,6 +8,7 @@
 #include <string_view>
 
 #include "core/format_text.h"
+#include "core/write_text.h"
 #include "diag/signal_report.h"
 #include "platform/signal_handler.h"
 
@@ -50,7 +51,7 @@ void print(const char* text)
         return;
     }
     static const std::ios_base::Init streams_are_ready;
-    std::cerr << text;
+    zt_core::write_text(std::cerr, text);
 }
 
 void make_default_handler()

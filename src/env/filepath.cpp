@@ -12,6 +12,7 @@
 #include "ZT/util.h"
 
 #include "core/text_stream.h"
+#include "core/write_text.h"
 #include "platform/files.h"
 
 namespace {
@@ -81,7 +82,7 @@ void ZtFilePath::Write(std::ostream& out, int parts)
 {
     const int meant = parts_meant(parts);
     for (int part = 0; part < meant; ++part)
-        out << ArgText(part);
+        zt_core::write_text(out, ArgText(part));
 }
 
 const char* ZtFilePath::FullPath() const

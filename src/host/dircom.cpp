@@ -2,6 +2,7 @@
 
 #include <cstring>
 #include <fstream>
+#include <initializer_list>
 #include <iostream>
 #include <new>
 #include <sstream>
@@ -9,9 +10,16 @@
 #include <utility>
 
 #include "core/number_text.h"
+#include "core/write_text.h"
 #include "platform/process.h"
 
 namespace {
+void say(std::initializer_list<const char*> texts)
+{
+    for (const char* text : texts)
+        zt_core::write_text(std::cerr, text);
+}
+
 void run_script(std::istream& in, ZtDispatcher& dispatcher)
 {
     KvoStatement statement;
@@ -53,12 +61,12 @@ void ZtCommonDirectives::Act(KvoStatement* statement, int selector)
     case Timer:
         statement->EatArg(0);
         statement->Write(std::cerr);
-        std::cerr << " " << zt_core::float_to_text(stopwatch.Mark()) << "\n";
+        say({" ", zt_core::float_to_text(stopwatch.Mark()).c_str(), "\n"});
         break;
     case Echo:
         statement->EatArg(0);
         statement->Write(std::cerr);
-        std::cerr << "\n";
+        say({"\n"});
         break;
     case Included:
         Include(statement->ArgText(1));
@@ -85,7 +93,7 @@ void ZtCommonDirectives::Include(const char* name)
     if (open_script(in, name))
         run_script(in, dispatcher);
     else
-        std::cerr << "Error - ZtDispatcher: Cannot open file " << name << "\n";
+        say({"Error - ZtDispatcher: Cannot open file ", name, "\n"});
 }
 
 void ZtCommonDirectives::System(KvoStatement* statement)

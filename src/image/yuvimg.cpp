@@ -1,5 +1,6 @@
 #include "image/picture.h"
 
+#include "core/write_text.h"
 #include "platform/files.h"
 
 #include <algorithm>
@@ -100,7 +101,9 @@ Picture read_yuv(const char* name, ChannelOrder order)
         return {};
     zt_platform::InputFile file(name);
     if (!file.is_open()) {
-        std::cerr << "Couldn't open yuv file [" << (name ? name : "") << "]\n";
+        for (const char* text :
+             {"Couldn't open yuv file [", name ? name : "", "]\n"})
+            zt_core::write_text(std::cerr, text);
     } else if (!decode_frame(file, pixels, order)) {
         std::free(pixels);
         return {};

@@ -3,6 +3,7 @@
 #include <iostream>
 #include <string>
 
+#include "core/write_text.h"
 #include "platform/alarm.h"
 #include "platform/clock.h"
 #include "time/beat_alarm.h"
@@ -229,6 +230,7 @@ const ZtTimerBeatStatistics& ZtTimerBeat::Statistics()
 void checktimer()
 {
     const zt_platform::AlarmLeft left = Alarm::current().left();
-    std::cerr << "Itimer " + std::to_string(left.seconds) + " " +
-                     std::to_string(left.microseconds) + "\n";
+    const std::string text = "Itimer " + std::to_string(left.seconds) + " " +
+                             std::to_string(left.microseconds) + "\n";
+    zt_core::write_text(std::cerr, text.c_str());
 }

@@ -1,4 +1,5 @@
 #include <clocale>
+#include <cstring>
 #include <new>
 #include <random>
 #include <sstream>
@@ -335,6 +336,20 @@ TEST(KvoTokenList, CopiesAndAssignsItsTokens)
     EXPECT_EQ(texts_of(assigned), (Texts{"a", "b c", "d"}));
     assigned.Append(in);
     EXPECT_EQ(texts_of(assigned), (Texts{"a", "b c", "d", "e"}));
+}
+
+TEST(KvoTokenList, ACopyOfAnEmptyListTakesNothingFromTheMemoryItIsMadeIn)
+{
+    alignas(KvoTokenList) unsigned char room[sizeof(KvoTokenList)];
+    std::memset(room, 0xA5, sizeof room);
+    const KvoTokenList empty("", ";");
+    std::istringstream in("a b;c");
+
+    KvoTokenList* copy = new (room) KvoTokenList(empty);
+    copy->Read(in);
+
+    EXPECT_EQ(texts_of(*copy), (Texts{"a", "b"}));
+    copy->~KvoTokenList();
 }
 
 TEST(KvoTokenList, AnAssignedListForgetsItsOwnTokens)

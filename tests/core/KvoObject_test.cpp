@@ -516,6 +516,21 @@ TEST(KvoNamedObject, WritesTheNameAsItStands)
     EXPECT_EQ(Written(object), "two words; \"%n\"");
 }
 
+TEST(KvoNamedObject, WritesTheSameWhateverTheStreamIsSetTo)
+{
+    KvoNamedObject object("edge");
+    std::ostringstream wide;
+    wide.width(6);
+    std::ostream broken(nullptr);
+    EXPECT_THROW(broken.exceptions(std::ios::badbit), std::ios::failure);
+
+    object.Write(wide);
+
+    EXPECT_EQ(wide.str(), "edge");
+    EXPECT_NO_THROW(object.Write(broken));
+    EXPECT_TRUE(broken.bad());
+}
+
 TEST(KvoNamedObject, KeepsTheModifiedFlagOfTheBase)
 {
     KvoNamedObject object("edge");

@@ -11,6 +11,7 @@
 #include "diag/Reports.h"
 #include "support/ErrorTrap.h"
 #include "support/FailingMemory.h"
+#include "support/ThrowingStderr.h"
 
 namespace {
 
@@ -307,6 +308,15 @@ TEST(ZtErrHandler, PrintsToStandardErrorWhateverTheOutputStream)
 
     EXPECT_EQ(elsewhere.str(), "");
     EXPECT_EQ(ZtErrHandler::output, &elsewhere);
+}
+
+TEST(ZtErrHandler, NothingThrowsWhenStandardErrorDoes)
+{
+    const ThrowingStderr no_output;
+
+    EXPECT_NO_THROW(PostText("Error: lost\n"));
+
+    EXPECT_TRUE(std::cerr.bad());
 }
 
 TEST(ZtErrHandler, SetOutputStreamToNullIsStandardError)

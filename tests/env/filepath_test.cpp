@@ -218,6 +218,22 @@ TEST(ZtFilePath, WritesThatManyPartsFewer)
     EXPECT_EQ(Written(path, std::numeric_limits<int>::min()), "");
 }
 
+TEST(ZtFilePath, WritesTheSameWhateverTheStreamIsSetTo)
+{
+    ZtFilePath path("a/b");
+    std::ostringstream wide;
+    wide.width(5);
+    std::ostream broken(nullptr);
+    EXPECT_THROW(broken.exceptions(std::ios::badbit), std::ios::failure);
+
+    path.Write(wide);
+
+    EXPECT_EQ(wide.str(), "a/b");
+    EXPECT_NO_THROW(path.Write(broken));
+    EXPECT_NO_THROW(path.Write(broken, 1));
+    EXPECT_TRUE(broken.bad());
+}
+
 // --- accessors -------------------------------------------------------------
 
 TEST(ZtFilePath, FullPathIsAllOfIt)

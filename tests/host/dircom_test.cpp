@@ -17,6 +17,7 @@
 #include "support/FakeProcesses.h"
 #include "support/OtherLocale.h"
 #include "support/TempDir.h"
+#include "support/ThrowingStderr.h"
 
 namespace {
 
@@ -197,6 +198,20 @@ TEST_F(CommonDirectives, TimerReadsNegativeWhenTheClockIsSetBack)
     clock.AdvanceMicroseconds(-1500000);
 
     EXPECT_EQ(Told("Timer\n"), " -1.5\n");
+}
+
+TEST_F(CommonDirectives, NothingThrowsWhenStandardErrorDoes)
+{
+    ErrorTrap reports;
+    KvoStatement timer("timer"), echo("echo"), script("include");
+    echo.AddArg("a");
+    script.AddArg("nofile");
+    const ThrowingStderr no_output;
+
+    EXPECT_NO_THROW(dispatcher.Delegate(&timer));
+    EXPECT_NO_THROW(dispatcher.Delegate(&echo));
+    EXPECT_NO_THROW(dispatcher.Delegate(&script));
+    EXPECT_TRUE(std::cerr.bad());
 }
 
 // --- cd and System ---------------------------------------------------------

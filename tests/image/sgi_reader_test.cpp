@@ -198,6 +198,31 @@ TEST(sgi_reader, OnlyRowsOutOfOrderHaveABound)
     EXPECT_EQ(Read(SgiFile(fields, longer)), PixelList(16, 0xFF424140));
 }
 
+// Rows that start where the one before does are not out of order.
+TEST(sgi_reader, RowsThatShareTheirStartHaveNoBound)
+{
+    SgiFields fields = {.width = 2, .height = 2, .channels = 1};
+    const std::string row = Bytes({2, 9, 0});
+
+    auto pixels = Read(SgiFile(fields, {.rows = {row, ""},
+                                        .lengths = {{0, 500}, {1, 500}},
+                                        .starts = {{1, 512 + 16}}}));
+
+    EXPECT_EQ(pixels, PixelList(4, 0xFF090909));
+}
+
+TEST(sgi_reader, TheBoundHoldsForAChannelThatIsDroppedToo)
+{
+    SgiFields fields = {.width = 4, .height = 4, .channels = 2};
+    SgiRows rows = {.rows = PlainRows(fields), .by_channel = true};
+    rows.lengths = {{7, 14}};
+    EXPECT_EQ(Read(SgiFile(fields, rows)), PixelList(16, 0xFF404040));
+
+    rows.lengths = {{7, 15}};
+
+    EXPECT_EXIT(Read(SgiFile(fields, rows)), testing::ExitedWithCode(1), "^$");
+}
+
 TEST(sgi_reader, AnOverlongRowIsAFailureWhenItsHandlerReturns)
 {
     ZtSetOverlongRowHandler([] {});

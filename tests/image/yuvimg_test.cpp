@@ -11,6 +11,7 @@
 #include "support/FaultyFiles.h"
 #include "support/InAChild.h"
 #include "support/TempDir.h"
+#include "support/ThrowingStderr.h"
 
 namespace {
 
@@ -187,6 +188,17 @@ TEST(yuvimg, AFrameThatCannotBeOpenedIsSaidAndAllZeros)
 
     EXPECT_EQ(printed.Text(), "Couldn't open yuv file [" + path + "]\n");
     EXPECT_EQ(pixels, PixelList(frame_pixels, 0));
+}
+
+TEST(yuvimg, NothingThrowsWhenStandardErrorDoes)
+{
+    const ThrowingStderr no_output;
+    ZtPixel* pixels = nullptr;
+
+    EXPECT_NO_THROW(pixels = longimageyuvdata(nullptr));
+
+    EXPECT_EQ(Taken(pixels, frame_pixels), PixelList(frame_pixels, 0));
+    EXPECT_TRUE(std::cerr.bad());
 }
 
 TEST(yuvimg, NoNameIsAnEmptyName)

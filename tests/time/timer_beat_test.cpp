@@ -5,6 +5,7 @@
 
 #include "support/BeatTest.h"
 #include "support/CapturedStderr.h"
+#include "support/ThrowingStderr.h"
 
 namespace {
 
@@ -608,6 +609,15 @@ TEST_F(ZtTimerBeatTest, CheckTimerPrintsWhatIsLeft)
     checktimer();
 
     EXPECT_EQ(captured.Text(), "Itimer 3 250000\n");
+}
+
+TEST_F(ZtTimerBeatTest, CheckTimerNeverThrows)
+{
+    const ThrowingStderr no_output;
+
+    EXPECT_NO_THROW(checktimer());
+
+    EXPECT_TRUE(std::cerr.bad());
 }
 
 TEST_F(ZtTimerBeatTest, ErrnoIsKeptForTheInterruptedCode)

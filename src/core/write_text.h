@@ -1,5 +1,5 @@
-#ifndef ZT_COMMAND_WRITE_TEXT_H
-#define ZT_COMMAND_WRITE_TEXT_H
+#ifndef ZT_CORE_WRITE_TEXT_H
+#define ZT_CORE_WRITE_TEXT_H
 
 /// \file
 /// Writing of text as it stands: no width, no fill, and no throwing, whatever
@@ -8,7 +8,7 @@
 #include <cstring>
 #include <ostream>
 
-namespace zt_command {
+namespace zt_core {
 /// Writes the characters of `text` up to its NUL.
 ///
 /// A stream that its owner told to throw does not throw from here; its state
@@ -31,6 +31,6 @@ inline void write_character(std::ostream& out, char character)
         // The state bits tell.
     }
 }
-} // namespace zt_command
+} // namespace zt_core
 
 #endif
