@@ -214,6 +214,8 @@ public:
     /// Makes an iterator at the same place as `other`.
     KvoListIter(const KvoListIter& other);
 
+    virtual ~KvoListIter();
+
     /// Moves to the list and the place of `other`.
     KvoListIter& operator=(const KvoListIter& other);
 

@@ -312,6 +312,8 @@ KvoListIter::KvoListIter(const KvoListIter& other)
     *this = other;
 }
 
+KvoListIter::~KvoListIter() = default;
+
 KvoListIter& KvoListIter::operator=(const KvoListIter& other)
 {
     if (this == &other)

@@ -1,8 +1,12 @@
 #include "KVO/KvoList.h"
 
+#include <memory>
+#include <type_traits>
 #include <vector>
 
 #include <gtest/gtest.h>
+
+#include "KVO/KvoObject.h"
 
 namespace {
 
@@ -62,6 +66,28 @@ TEST(KvoListIter, NewOneStandsBeforeTheFirstItem)
     EXPECT_EQ(may_not.direction, KvoListIter::Backward);
     EXPECT_EQ(may_not.start.prev, list.tail);
     EXPECT_EQ(may_not.start.next, nullptr);
+}
+
+TEST(KvoListIter, IsNoObjectButMayBeDestroyedThroughItsBase)
+{
+    class Noting : public KvoListIter
+    {
+    public:
+        Noting(KvoList& walked, bool& noted) : KvoListIter(walked), gone(noted)
+        {}
+        ~Noting() override { gone = true; }
+
+    private:
+        bool& gone;
+    };
+    KvoList list = ListOf({&a});
+    bool gone = false;
+
+    std::unique_ptr<KvoListIter> walk = std::make_unique<Noting>(list, gone);
+    walk.reset();
+
+    EXPECT_TRUE(gone);
+    EXPECT_FALSE((std::is_base_of_v<KvoObject, KvoListIter>));
 }
 
 TEST(KvoListIter, DirectionsAreStoredNumbers)
