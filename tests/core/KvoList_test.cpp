@@ -5,6 +5,8 @@
 
 #include <gtest/gtest.h>
 
+#include "KVO/KvoObject.h"
+
 namespace {
 
 using Items = std::vector<void*>;
@@ -64,6 +66,7 @@ TEST(KvoList, NewOneIsEmpty)
     EXPECT_EQ(list.current, nullptr);
     EXPECT_EQ(list.count, 0);
     EXPECT_TRUE(std::has_virtual_destructor_v<KvoList>);
+    EXPECT_FALSE((std::is_base_of_v<KvoObject, KvoList>));
 }
 
 TEST(KvoList, CopySharesTheItemsWithItsCursorOnTheTail)
@@ -462,6 +465,19 @@ TEST(KvoList, RemoveAtAnEndIsAPop)
     EXPECT_EQ(ItemsOf(list), (Items{&b, &c}));
 }
 
+TEST(KvoList, RemoveOfAnItemAtAnEndIsAPop)
+{
+    KvoList list = ListOf({&a, &b, &c, &d});
+
+    list.Remove(&a);
+    void* new_head = UnderCursor(list);
+    list.Remove(&d);
+
+    EXPECT_EQ(new_head, &b);
+    EXPECT_EQ(UnderCursor(list), &c);
+    EXPECT_EQ(ItemsOf(list), (Items{&b, &c}));
+}
+
 TEST(KvoList, RemoveOfTheOnlyItemEmptiesTheList)
 {
     KvoList list = ListOf({&a});
@@ -513,11 +529,14 @@ TEST(KvoList, SinkMovesToTheTail)
 
 TEST(KvoList, FloatAndSinkOfAnItemTwiceInTheListMoveItsFirst)
 {
-    KvoList list = ListOf({&a, &b, &c, &b});
+    KvoList floated = ListOf({&a, &b, &c, &b});
+    KvoList sunk = ListOf({&a, &b, &c, &b});
 
-    list.Sink(&b);
+    floated.Float(&b);
+    sunk.Sink(&b);
 
-    EXPECT_EQ(ItemsOf(list), (Items{&a, &c, &b, &b}));
+    EXPECT_EQ(ItemsOf(floated), (Items{&b, &a, &c, &b}));
+    EXPECT_EQ(ItemsOf(sunk), (Items{&a, &c, &b, &b}));
 }
 
 TEST(KvoList, FloatAndSinkOfAnAbsentItemPushIt)

@@ -1,6 +1,7 @@
 #include "KVO/KvoObjList.h"
 
-#include <vector>
+#include <string>
+#include <type_traits>
 
 #include <gtest/gtest.h>
 
@@ -60,6 +61,7 @@ TEST(KvoObjList, DestroyingItThroughItsBaseFreesTheLinks)
     delete base;
 
     EXPECT_EQ(Counted::alive, 1);
+    EXPECT_FALSE((std::is_base_of_v<KvoObject, KvoObjList>));
 }
 
 TEST(KvoObjList, CopyAndAssignmentShareTheObjects)
@@ -136,6 +138,34 @@ TEST(KvoObjList, CloneContentsLeavesTheOldObjectsToOthers)
     EXPECT_STREQ(NameOf(list[2]), "b");
     list.DeleteContents();
     EXPECT_EQ(Counted::alive, 2);
+}
+
+TEST(KvoObjList, CloneContentsGoesFromHeadToTailAndLeavesTheCursorAlone)
+{
+    static std::string cloned;
+    class Noting : public Counted
+    {
+    public:
+        using Counted::Counted;
+        KvoObject* Clone() override
+        {
+            cloned += name;
+            return new Counted(name);
+        }
+    };
+    Noting a("a"), b("b"), c("c");
+    KvoObjList list;
+    for (KvoObject* object : {&a, &b, &c})
+        list.PushTail(object);
+    list.Head();
+    list.Next();
+    KvoList::Link* cursor = list.current;
+
+    list.CloneContents();
+
+    EXPECT_EQ(cloned, "abc");
+    EXPECT_EQ(list.current, cursor);
+    list.DeleteContents();
 }
 
 TEST(KvoObjList, FormsWithAFunctionAreThereToo)

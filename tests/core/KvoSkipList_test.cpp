@@ -438,6 +438,32 @@ TEST(KvoSkipList, CloneContentsLeavesTheOldObjectsToOthers)
     EXPECT_EQ(Number::alive, 3);
 }
 
+TEST(KvoSkipList, CloneContentsGoesInOrderAndLeavesTheCursorAlone)
+{
+    static std::vector<int> cloned;
+    class Noting : public Number
+    {
+    public:
+        using Number::Number;
+        KvoObject* Clone() override
+        {
+            cloned.push_back(key);
+            return new Number(key);
+        }
+    };
+    Noting two(2), three(3), one(1);
+    KvoSkipList list;
+    for (Number* number : {&two, &three, &one})
+        list.Insert(number);
+    KvoSkipList::SLNode* cursor = list.current;
+
+    list.CloneContents();
+
+    EXPECT_EQ(cloned, (std::vector<int>{1, 2, 3}));
+    EXPECT_EQ(list.current, cursor);
+    list.DeleteContents();
+}
+
 namespace {
 /// Filled before `main` and dropped after it.
 struct Early

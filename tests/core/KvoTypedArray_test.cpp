@@ -1,5 +1,7 @@
 #include "KVO/KvoArray.h"
 
+#include <type_traits>
+
 #include <gtest/gtest.h>
 
 TEST(KvoTypedArray, HasItsElementsSize)
@@ -29,6 +31,34 @@ TEST(KvoTypedArray, KeepsItsElements)
     EXPECT_EQ(bytes[1], 255);
     EXPECT_EQ(texts[1], text);
     EXPECT_EQ(texts[0], nullptr);
+}
+
+namespace {
+
+template <typename Array>
+void CheckGrowth(const char* kind)
+{
+    Array array;
+
+    auto& element = array[3];
+    using Element = std::remove_reference_t<decltype(element)>;
+
+    EXPECT_TRUE(element == Element()) << kind;
+    EXPECT_EQ(array.size, 4) << kind;
+    EXPECT_EQ(array.capacity, 5) << kind;
+    for (int i = 0; i < 4; ++i)
+        EXPECT_TRUE(array[i] == Element()) << kind << ' ' << i;
+}
+
+} // namespace
+
+TEST(KvoTypedArray, GrowsWithZerosWhateverItsElements)
+{
+    CheckGrowth<KvoFloatArray>("float");
+    CheckGrowth<KvoIntArray>("int");
+    CheckGrowth<KvoCharArray>("char");
+    CheckGrowth<KvoByteArray>("byte");
+    CheckGrowth<KvoStringArray>("text");
 }
 
 TEST(KvoTypedArray, TextsOutliveTheArray)

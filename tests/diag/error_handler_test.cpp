@@ -33,6 +33,27 @@ private:
     const char* name;
 };
 
+/// Counts how many of its kind were deleted.
+class Telltale : public ZtErr
+{
+public:
+    Telltale(const char* text, int severity) : ZtErr(text, 0, severity) {}
+    ~Telltale() override
+    {
+        ++deleted;
+        if (tells)
+            std::cerr << "deleted\n";
+    }
+
+    static void Posted(const char* text, int severity)
+    {
+        (new Telltale(text, severity))->Post();
+    }
+
+    static inline int deleted = 0;
+    static inline bool tells = false;
+};
+
 template <class Operation>
 std::ptrdiff_t SlotOf(Operation operation)
 {
@@ -231,6 +252,91 @@ TEST(ZtErrHandler, DestroyedOutOfOrderIsReportedAndAborts)
     delete one;
 }
 
+TEST(ZtErrHandler, DestroyedOutOfOrderIsAMessageOfLevelFour)
+{
+    class Telling : public ZtErrHandler
+    {
+    public:
+        void Handle(ZtErr* error) override
+        {
+            std::cerr << "kind " << error->code << " level " << error->level
+                      << ' ';
+            ZtErrHandler::Handle(error);
+        }
+    };
+    auto* one = new ZtErrHandler;
+    auto* two = new Telling;
+
+    EXPECT_EXIT(delete one, aborted,
+                "^kind 0 level 4 Error: handler stack confused\n$");
+
+    delete two;
+    delete one;
+}
+
+TEST(ZtErrHandler, DestroyedOutOfOrderReleasesWhatItHoldsFirst)
+{
+    const auto build_and_destroy = [] {
+        auto* one = new ZtErrHandler(1);
+        PostText("one\n");
+        new ZtErrHandler;
+        delete one;
+    };
+
+    EXPECT_EXIT(build_and_destroy(), aborted,
+                "^one\nError: handler stack confused\n$");
+}
+
+TEST(ZtErrHandler, ASubclassIsNoLongerItselfWhenItsBaseReleases)
+{
+    ErrorTrap below;
+    const std::string told = Printed([] {
+        Teller teller("t", 1);
+        PostText("one");
+    });
+
+    EXPECT_EQ(told, "");
+    EXPECT_EQ(below.Text(), "one");
+}
+
+TEST(ZtErrHandler, HoldsBackForEveryFlagButZero)
+{
+    for (const int flag : {2, -1}) {
+        ErrorTrap below;
+        ZtErrHandler holding(flag);
+
+        PostText("one");
+
+        EXPECT_EQ(holding.held, flag);
+        EXPECT_EQ(holding.queue.count, 1);
+        EXPECT_EQ(below.Text(), "");
+    }
+}
+
+TEST(ZtErrHandler, TheBottomDeletesWhatItPrintsAndWhatItDrops)
+{
+    Telltale::deleted = 0;
+    Printed([] { Telltale::Posted("printed\n", 3); });
+    const int after_printed = Telltale::deleted;
+    Telltale::Posted("dropped\n", 1);
+
+    EXPECT_EQ(after_printed, 1);
+    EXPECT_EQ(Telltale::deleted, 2);
+}
+
+TEST(ZtErrHandler, TheBottomDeletesAFatalErrorBeforeItAborts)
+{
+    const auto build_and_fail = [] {
+        auto* below = new ZtErrHandler;
+        new ZtErrHandler(1);
+        PostText("held\n");
+        Telltale::tells = true;
+        below->Deliver(new Telltale("fatal\n", 5));
+    };
+
+    EXPECT_EXIT(build_and_fail(), aborted, "^fatal\ndeleted\nheld\n$");
+}
+
 TEST(ZtErrHandler, AbortReleasesEveryHandlerTheTopFirst)
 {
     const auto build_and_abort = [] {
@@ -290,9 +396,10 @@ TEST(ZtErrHandler, AHandlerOnTopDecidesWhetherAFatalErrorAborts)
 TEST(ZtErrHandler, ReleasesWhatIsHeldBeforeAFatalErrorEndsAll)
 {
     const auto build_and_fail = [] {
-        auto* holding = new ZtErrHandler(1);
+        auto* below = new ZtErrHandler;
+        new ZtErrHandler(1);
         PostText("one\n");
-        holding->next->Deliver(new ZtErr("fatal\n", 0, 5));
+        below->Deliver(new ZtErr("fatal\n", 0, 5));
     };
 
     EXPECT_EXIT(build_and_fail(), aborted, "^fatal\none\n$");
