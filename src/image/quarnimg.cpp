@@ -48,7 +48,7 @@ public:
     /// picture's, and steps to the row below if the row is full.
     void put(std::size_t run, ZtPixel pixel)
     {
-        std::size_t first = std::min(row_start + position, count);
+        std::size_t first = row_start + position;
         std::fill_n(pixels + first, std::min(run, count - first), pixel);
         position += run;
         if (position < width)

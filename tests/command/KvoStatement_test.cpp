@@ -8,6 +8,7 @@
 #include <gtest/gtest.h>
 
 #include "ZT/statement.h"
+#include "support/FailingMemory.h"
 #include "support/OddStreams.h"
 #include "support/OtherLocale.h"
 
@@ -516,6 +517,20 @@ TEST(KvoStatement, EatArgRemovesAWordOrNothing)
     EXPECT_EQ(statement.Count(), 0);
     statement.EatArg(0);
     EXPECT_EQ(statement.Count(), 0);
+}
+
+TEST(KvoStatement, WithoutMemoryForAWordItReadsOneStatementAndNoMore)
+{
+    std::istringstream in("a # b\nc\n");
+    KvoStatement statement;
+    {
+        const FailingMemory none;
+        statement.Read(in);
+    }
+
+    EXPECT_TRUE(FailingMemory::Failed());
+    EXPECT_EQ(statement.Count(), 0);
+    EXPECT_EQ(RestOf(in), "c\n");
 }
 
 TEST(KvoStatement, CopiesKeepReadingAsStatements)

@@ -1,5 +1,6 @@
 #include <clocale>
 #include <cstring>
+#include <malloc.h>
 #include <new>
 #include <random>
 #include <sstream>
@@ -375,6 +376,31 @@ TEST(KvoTokenList, HoldsManyTokensAndFewAgain)
     list.Read(in);
 
     EXPECT_EQ(texts_of(list), (Texts{"a", "b"}));
+}
+
+// Counts what the allocator of the system has given out, which is none at all
+// where another one stands in for it.
+TEST(KvoTokenList, GivesBackWhatTheNextRunWillNotNeed)
+{
+    constexpr std::size_t megabyte = std::size_t{1} << 20;
+    std::string many;
+    for (int i = 0; i < 100000; ++i)
+        many += "x ";
+    std::istringstream short_ones(many + ";");
+    std::istringstream long_one(std::string(4 * megabyte, 'x') + " ;");
+    KvoTokenList list("", ";");
+    const auto given_out = [] {
+        const auto info = mallinfo2();
+        return info.uordblks + info.hblkhd;
+    };
+    const std::size_t before = given_out();
+
+    list.Read(short_ones);
+    list.Clear();
+    EXPECT_LT(given_out(), before + 2 * megabyte);
+    list.Read(long_one);
+    list.Clear();
+    EXPECT_LT(given_out(), before + 2 * megabyte);
 }
 
 TEST(KvoTokenList, RunsOfAllSortsInOneListLeaveTheOneBehind)
