@@ -17,8 +17,11 @@ constexpr int input_descriptor = 0;
 
 Shell::Shell(const Settings& settings)
     : runner(settings), common(runner), language(runner),
-      picture_words(runner, pictures), sequences(runner, pictures)
+      picture_words(runner, pictures), sequences(runner, pictures),
+      times(runner), beat(runner), clock_words(runner, clocks),
+      wait(runner, clocks), shuttles(runner)
 {
+    runner.RunWhenDue(&clocks);
     SurviveOverlongRows();
 }
 
@@ -55,7 +58,7 @@ void Shell::run_prompt()
 {
     auto words = [this] { return CommandWords(runner.dispatcher); };
     std::unique_ptr<LineEditor> editor =
-        MakeTerminalEditor(HistoryPath(), words);
+        MakeTerminalEditor(HistoryPath(), words, runner);
     PromptSource source(*editor);
     runner.RunPrompt(source);
 }

@@ -7,10 +7,16 @@
 #include "options.h"
 #include "pictures/picture_table.h"
 #include "script/runner.h"
+#include "time/clock_table.h"
+#include "words/beat_words.h"
+#include "words/clock_words.h"
 #include "words/common_words.h"
 #include "words/language_words.h"
 #include "words/picture_words.h"
 #include "words/sequence_words.h"
+#include "words/shuttle_words.h"
+#include "words/time_words.h"
+#include "words/wait_words.h"
 
 namespace ztsh {
 
@@ -31,10 +37,16 @@ private:
 
     Runner runner;
     PictureTable pictures;
+    ClockTable clocks;
     CommonWords common;
     LanguageWords language;
     PictureWords picture_words;
     SequenceWords sequences;
+    TimeWords times;
+    BeatWords beat;
+    ClockWords clock_words;
+    WaitWords wait;
+    ShuttleWords shuttles;
 };
 
 } // namespace ztsh

@@ -4,6 +4,8 @@
 /// \file
 /// Lines typed at a terminal, with editing, history and completion.
 
+#include "script/idle.h"
+
 #include <functional>
 #include <memory>
 #include <string>
@@ -36,9 +38,14 @@ public:
 using WordLister = std::function<std::vector<std::string>()>;
 
 /// Makes the line editor of the terminal on standard input. Lines are kept in
-/// the history file `history_path`, unless that is empty.
+/// the history file `history_path`, unless that is empty. While it waits for a
+/// key it does what there is to do in `waiting_idle`, with the line out of the
+/// way.
+///
+/// Requires: `waiting_idle` outlives the editor.
 std::unique_ptr<LineEditor> MakeTerminalEditor(const std::string& history_path,
-                                               WordLister words);
+                                               WordLister words,
+                                               Idle& waiting_idle);
 
 } // namespace ztsh
 

@@ -44,15 +44,21 @@ private:
     struct sigaction former;
 };
 
-class TerminalEditor : public LineEditor
+class TerminalEditor : public LineEditor, private Idle
 {
 public:
-    TerminalEditor(const std::string& history_path, WordLister lister);
+    TerminalEditor(const std::string& history_path, WordLister lister,
+                   Idle& waiting_idle);
     ~TerminalEditor() override;
 
     Typed Ask(const std::string& prompt, std::string& line) override;
 
 private:
+    bool Due() const override { return window_changed || idle.Due(); }
+    void RunDue() override;
+    bool Over() const override { return idle.Over(); }
+
+    void hide_line();
     static TerminalEditor& of(EditLine* editor);
     static char* show_prompt(EditLine* editor);
     static int read_character(EditLine* editor, wchar_t* character);
@@ -64,14 +70,15 @@ private:
     History* past;
     HistoryFile file;
     WordLister words;
+    Idle& idle;
     std::string prompt_text;
     std::string last_line;
 };
 
 TerminalEditor::TerminalEditor(const std::string& history_path,
-                               WordLister lister)
+                               WordLister lister, Idle& waiting_idle)
     : edit(nullptr), past(history_init()), file(history_path),
-      words(std::move(lister))
+      words(std::move(lister)), idle(waiting_idle)
 {
     // Only what a character is depends on the user's locale; numbers do not.
     std::setlocale(LC_CTYPE, "");
@@ -141,19 +148,51 @@ char* TerminalEditor::show_prompt(EditLine* editor)
     return of(editor).prompt_text.data();
 }
 
+/// Runs what is due below the line, which is drawn again afterwards.
+void TerminalEditor::RunDue()
+{
+    if (std::exchange(window_changed, 0) != 0)
+        el_resize(edit);
+    if (!idle.Due())
+        return;
+    hide_line();
+    el_set(edit, EL_PREP_TERM, 0);
+    idle.RunDue();
+    el_set(edit, EL_PREP_TERM, 1);
+    el_set(edit, EL_REFRESH);
+}
+
+/// Clears what is shown of the line, from its first row on.
+void TerminalEditor::hide_line()
+{
+    const LineInfo* info = el_line(edit);
+    std::string before = prompt_text + std::string(info->buffer, info->cursor);
+    std::mbstate_t state = {};
+    const char* from = before.c_str();
+    std::size_t cells = std::mbsrtowcs(nullptr, &from, 0, &state);
+    constexpr std::size_t wrong = static_cast<std::size_t>(-1);
+    int columns = SizeOfWindow(STDOUT_FILENO).columns;
+    int rows = cells == wrong ? 0 : static_cast<int>(cells) / columns;
+    if (rows > 0)
+        std::printf("\033[%dA", rows);
+    std::fputs("\r\033[J", stdout);
+    std::fflush(stdout);
+}
+
 /// Reads one character. A caught signal ends the line, a change of the window
 /// only draws it anew.
 int TerminalEditor::read_character(EditLine* editor, wchar_t* character)
 {
     std::mbstate_t state = {};
     for (;;) {
+        WaitEnds ends;
+        ends.descriptor = STDIN_FILENO;
+        if (WaitFor(ends, of(editor)) == Waited::Over)
+            return 0;
         char byte = 0;
-        ssize_t got = StopSignal() != 0 ? 0 : read(STDIN_FILENO, &byte, 1);
-        if (got < 0 && errno == EINTR) {
-            if (std::exchange(window_changed, 0) != 0)
-                el_resize(editor);
+        ssize_t got = read(STDIN_FILENO, &byte, 1);
+        if (got < 0 && errno == EINTR)
             continue;
-        }
         if (got <= 0)
             return static_cast<int>(got);
         // The key that ends the input comes like this if it was struck while
@@ -212,9 +251,11 @@ void TerminalEditor::remember(const std::string& line)
 } // namespace
 
 std::unique_ptr<LineEditor> MakeTerminalEditor(const std::string& history_path,
-                                               WordLister words)
+                                               WordLister words,
+                                               Idle& waiting_idle)
 {
-    return std::make_unique<TerminalEditor>(history_path, std::move(words));
+    return std::make_unique<TerminalEditor>(history_path, std::move(words),
+                                            waiting_idle);
 }
 
 } // namespace ztsh

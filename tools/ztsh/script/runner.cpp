@@ -103,7 +103,7 @@ void Runner::RunFile(const std::string& name)
     safe_directory =
         std::filesystem::weakly_canonical(directory_of(name), ignored).string();
     HereScope here(*this, directory_of(name));
-    ScriptBuffer buffer(descriptor);
+    ScriptBuffer buffer(descriptor, this);
     StreamSource source(name, buffer);
     run_to_end(source);
     close(descriptor);
@@ -143,6 +143,7 @@ void Runner::Run(StatementSource& source)
             return;
         if (next == Next::Got && StopSignal() == 0)
             delegate(statement);
+        RunDue();
     }
 }
 
@@ -156,6 +157,7 @@ void Runner::RunPrompt(StatementSource& source)
             return;
         if (next == Next::Got)
             delegate(statement);
+        RunDue();
         if (StopSignal() == SIGINT)
             ClearStopSignal();
     }
@@ -168,6 +170,33 @@ void Runner::delegate(KvoStatement& statement)
     std::cout.flush();
 }
 
+void Runner::RunWhenDue(DueStatements* statements)
+{
+    due = statements;
+}
+
+bool Runner::Due() const
+{
+    return due && !running_due && sequence_depth == 0 && due->Any();
+}
+
+/// Runs only what is due at the start, so that what becomes due again and again
+/// never keeps the script from going on.
+void Runner::RunDue()
+{
+    if (!Due() || Stopping())
+        return;
+    running_due = true;
+    for (const auto& taken : due->Take()) {
+        std::shared_ptr<const Statements> statements = taken.lock();
+        if (!statements || Stopping())
+            continue;
+        BlockSource source(*statements);
+        Run(source);
+    }
+    running_due = false;
+}
+
 Included Runner::Include(const char* name)
 {
     if (includes >= settings.most_includes) {
@@ -177,9 +206,15 @@ Included Runner::Include(const char* name)
         unwinding = true;
         return Included::Ran;
     }
+    bool from_input = !name || std::strcmp(name, "-") == 0;
+    if (from_input && running_due) {
+        ZtError("Include: a statement that became due does not read standard "
+                "input\n");
+        return Included::Ran;
+    }
     ++includes;
     Included came = Included::Ran;
-    if (!name || std::strcmp(name, "-") == 0)
+    if (from_input)
         Run(standard_input());
     else
         came = include_file(name);
@@ -212,7 +247,7 @@ Included Runner::include_file(const std::string& name)
     }
     HereScope here(*this, directory_of(name));
     {
-        ScriptBuffer buffer(descriptor);
+        ScriptBuffer buffer(descriptor, this);
         StreamSource source(name, buffer);
         Run(source);
     }
@@ -247,7 +282,7 @@ void Runner::KeepPlace()
 StreamSource& Runner::standard_input()
 {
     if (!input) {
-        input_buffer.emplace(STDIN_FILENO);
+        input_buffer.emplace(STDIN_FILENO, this);
         input.emplace("standard input", *input_buffer);
     }
     return *input;

@@ -6,6 +6,8 @@
 /// each, and keeps what all of that shares.
 
 #include "outcome.h"
+#include "script/due_statements.h"
+#include "script/idle.h"
 #include "script/reports.h"
 #include "script/script_buffer.h"
 #include "script/source.h"
@@ -34,7 +36,11 @@ enum class Included {
 };
 
 /// The running of scripts.
-class Runner
+///
+/// Statements that become due by themselves are run between two others, and
+/// while it waits; not inside each other, and not inside a sequence, whose
+/// frames have nothing to do with them.
+class Runner : public Idle
 {
 public:
     explicit Runner(const Settings& run_settings);
@@ -62,9 +68,20 @@ public:
     /// input.
     ///
     /// Reports: an error for a directory, for a script that a safe shell does
-    ///          not read, and when too many scripts include each other. The
-    ///          last unwinds all of them but the outermost.
+    ///          not read, for standard input by a statement that became due,
+    ///          since another one may be waiting for it, and when too many
+    ///          scripts include each other. The last unwinds all of them but
+    ///          the outermost.
     Included Include(const char* name);
+
+    /// Runs what becomes due in `statements` from now on; null for nothing.
+    ///
+    /// Requires: `statements` outlives its use here.
+    void RunWhenDue(DueStatements* statements);
+
+    bool Due() const override;
+    void RunDue() override;
+    bool Over() const override { return Stopping(); }
 
     /// Tells whether the statements that run are to be the last ones.
     bool Stopping() const;
@@ -83,6 +100,7 @@ public:
     ZtDispatcher dispatcher;
     Outcome outcome;
     Variables variables;
+    int sequence_depth = 0; ///< Sequences whose frames run, within each other.
 
 private:
     class SourceScope;
@@ -95,6 +113,8 @@ private:
     bool allowed_when_safe(const std::string& name) const;
     std::string shown_directory(const std::string& directory) const;
 
+    DueStatements* due = nullptr;
+    bool running_due = false;
     std::vector<StatementSource*> sources; ///< The innermost last.
     std::optional<Place> kept_place;       ///< Of its running statement.
     std::optional<ScriptBuffer> input_buffer;

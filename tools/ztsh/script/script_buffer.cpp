@@ -26,17 +26,17 @@ std::size_t block_bytes(int descriptor)
 
 } // namespace
 
-ScriptBuffer::ScriptBuffer(int script_descriptor)
-    : descriptor(script_descriptor), block(1 + block_bytes(script_descriptor)),
-      mark(nullptr), mark_line(1), lines_before(0), counted_to(nullptr),
-      counted(0)
+ScriptBuffer::ScriptBuffer(int script_descriptor, Idle* waiting_idle)
+    : descriptor(script_descriptor), idle(waiting_idle),
+      block(1 + block_bytes(script_descriptor)), mark(nullptr), mark_line(1),
+      lines_before(0), counted_to(nullptr), counted(0)
 {
     show_block(0);
 }
 
 ScriptBuffer::ScriptBuffer(const std::string& text)
-    : descriptor(-1), block(1 + text.size()), mark(nullptr), mark_line(1),
-      lines_before(0), counted_to(nullptr), counted(0)
+    : descriptor(-1), idle(nullptr), block(1 + text.size()), mark(nullptr),
+      mark_line(1), lines_before(0), counted_to(nullptr), counted(0)
 {
     std::memcpy(block.data() + 1, text.data(), text.size());
     show_block(text.size());
@@ -104,6 +104,8 @@ long ScriptBuffer::line_of(const char* place)
 std::size_t ScriptBuffer::read_more()
 {
     for (;;) {
+        if (idle && WaitFor({.descriptor = descriptor}, *idle) == Waited::Over)
+            return 0;
         if (StopSignal() != 0)
             return 0;
         ssize_t got = read(descriptor, block.data() + 1, block.size() - 1);

@@ -9,6 +9,8 @@
 /// tokenizer scans it in place. Lines are counted when somebody asks, and once
 /// a block when the next one takes its place.
 
+#include "script/idle.h"
+
 #include <streambuf>
 #include <string>
 #include <vector>
@@ -19,10 +21,14 @@ namespace ztsh {
 class ScriptBuffer : public std::streambuf
 {
 public:
-    /// Reads from `script_descriptor`, which stays the caller's.
+    /// Reads from `script_descriptor`, which stays the caller's; while it
+    /// waits, does what there is to do in `waiting_idle`, if that is not null.
     ///
-    /// A caught signal that asks the shell to stop is the end of the input.
-    explicit ScriptBuffer(int script_descriptor);
+    /// A caught signal that asks the shell to stop is the end of the input, as
+    /// is a wait that is given up.
+    ///
+    /// Requires: `waiting_idle` outlives the buffer.
+    explicit ScriptBuffer(int script_descriptor, Idle* waiting_idle = nullptr);
 
     /// Reads a copy of `text`.
     explicit ScriptBuffer(const std::string& text);
@@ -42,6 +48,7 @@ private:
     std::size_t read_more();
 
     int descriptor;          ///< -1 for a text.
+    Idle* idle;              ///< Null for none.
     std::vector<char> block; ///< One character to go back to, then the block.
     const char* mark;        ///< In the block, or null.
     long mark_line;          ///< Of a mark that is no longer in the block.

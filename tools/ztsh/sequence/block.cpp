@@ -9,7 +9,9 @@ namespace {
 
 constexpr const char* begin_word = "begin";
 constexpr const char* end_word = "end";
+constexpr const char* do_word = "do";
 constexpr const char* sequence_word = "Frames";
+constexpr const char* clock_word = "Clock";
 
 /// Tells the source how deep the statements stand, for as long as it lives.
 class DepthTeller
@@ -28,13 +30,21 @@ private:
 
 } // namespace
 
-bool OpensBlock(KvoStatement& statement)
+bool OpensBlock(KvoStatement& statement, int first)
 {
-    if (statement.Matches(begin_word, 0))
+    if (statement.Matches(begin_word, first))
         return true;
-    const char* word = statement.ArgText(0);
-    return word && strcasecmp(word, sequence_word) == 0 &&
-           statement.Matches(begin_word, statement.Count() - 1);
+    const char* word = statement.ArgText(first);
+    if (!word)
+        return false;
+    if (strcasecmp(word, sequence_word) == 0)
+        return statement.Matches(begin_word, statement.Count() - 1);
+    if (strcasecmp(word, clock_word) != 0)
+        return false;
+    int next = first + 1;
+    while (next < statement.Count() && !statement.Matches(do_word, next))
+        ++next;
+    return OpensBlock(statement, next + 1);
 }
 
 BlockRead ReadBlock(StatementSource& source, bool opened,

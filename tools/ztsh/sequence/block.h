@@ -19,10 +19,11 @@ enum class BlockRead {
     Cancelled, ///< The user took the block back.
 };
 
-/// Tells whether `statement` opens a block: it is "begin", or its last word is
-/// and its first one is the word `Frames`. "begin" minds the case, command
-/// words do not.
-bool OpensBlock(KvoStatement& statement);
+/// Tells whether the words of `statement` from position `first` on open a
+/// block: the first is "begin"; or it is `Frames` and the last is "begin"; or
+/// it is `Clock` and what stands behind its "do" opens one. "begin" and "do"
+/// mind the case, command words do not.
+bool OpensBlock(KvoStatement& statement, int first = 0);
 
 /// Reads a block into `block`, without its "begin" and "end".
 ///

@@ -2,7 +2,9 @@
 #define ZTSH_SYSTEM_TERMINAL_H
 
 /// \file
-/// What the shell asks about the terminal it may run in.
+/// What the shell asks about the terminal it may run in, and of it.
+
+#include <termios.h>
 
 namespace ztsh {
 
@@ -22,6 +24,29 @@ bool CanRedraw(int descriptor);
 
 /// Gives the window's size; 80 by 24 for one that does not say.
 WindowSize SizeOfWindow(int descriptor);
+
+/// Has a terminal give each key at once, and not show it, for as long as this
+/// lives. Keys that make signals go on doing so.
+class KeysAtOnce
+{
+public:
+    /// Requires: `terminal_descriptor` is a terminal.
+    explicit KeysAtOnce(int terminal_descriptor);
+    ~KeysAtOnce();
+    KeysAtOnce(const KeysAtOnce&) = delete;
+    KeysAtOnce& operator=(const KeysAtOnce&) = delete;
+
+    /// Gives the terminal back for a while.
+    void Pause();
+    void GoOn();
+
+    /// Reads the key that was hit, whatever it sends.
+    void TakeKey();
+
+private:
+    int descriptor;
+    termios former;
+};
 
 } // namespace ztsh
 

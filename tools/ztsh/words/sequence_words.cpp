@@ -5,6 +5,7 @@
 #include "system/signals.h"
 #include "system/terminal.h"
 
+#include <KVO/KvoTime.h>
 #include <ZT/error.h>
 
 #include <cstring>
@@ -89,7 +90,8 @@ void SequenceWords::frames(KvoStatement& statement)
     BlockRead read = ReadBlock(*runner.Source(), opened, block);
     if (read == BlockRead::NoEnd)
         ZtError("Frames: expected end, nothing was run\n");
-    if (read == BlockRead::Whole && right && depth >= most_depth)
+    if (read == BlockRead::Whole && right &&
+        runner.sequence_depth >= most_depth)
         ZtError("Frames: more than %d sequences within each other, this one "
                 "is not run\n",
                 most_depth);
@@ -111,14 +113,15 @@ void SequenceWords::skip_block()
 
 void SequenceWords::run(const FrameRange& range, const Block& block)
 {
-    bool show = depth == 0 && CanRedraw(errors_descriptor);
+    bool show = runner.sequence_depth == 0 && CanRedraw(errors_descriptor);
     Tally tally(range.Count(), show);
-    if (runner.settings.jobs > 1 && tally.count > 1 && depth == 0)
+    if (runner.settings.jobs > 1 && tally.count > 1 &&
+        runner.sequence_depth == 0)
         run_in_workers(range, block, tally);
     else
         run_here(range, block, tally);
     tally.bar.Hide();
-    if (StopSignal() != 0 && depth == 0)
+    if (StopSignal() != 0 && runner.sequence_depth == 0)
         std::cerr << "Frames: stopped after " << tally.done << " of "
                   << tally.count << " frames\n";
     if (tally.failed > 0)
@@ -163,15 +166,17 @@ int SequenceWords::run_frame(const std::string& frame, const Block& block)
     Variables variables = runner.variables;
     PictureTable former_pictures = pictures;
     Outcome outcome = runner.outcome;
+    std::int32_t rate = KvoTime::default_fps;
 
-    ++depth;
+    ++runner.sequence_depth;
     runner.outcome = Outcome();
     runner.variables.Set(frame_variable, frame);
     BlockSource source(block);
     runner.Run(source);
     int code = runner.outcome.Code();
 
-    --depth;
+    --runner.sequence_depth;
+    KvoTime::default_fps = rate;
     runner.outcome = outcome;
     pictures = former_pictures;
     runner.variables = variables;

@@ -17,9 +17,9 @@ namespace ztsh {
 /// processes if the shell has several. begin: skips a block that belongs to no
 /// such word.
 ///
-/// Every frame starts with the variables, pictures and directory that the
-/// sequence started with, whether it runs in a worker or not; what it changes
-/// of these is gone at its end.
+/// Every frame starts with the variables, pictures, directory and frame rate
+/// that the sequence started with, whether it runs in a worker or not; what it
+/// changes of these is gone at its end.
 class SequenceWords : public WordDirector
 {
 public:
@@ -46,7 +46,6 @@ private:
 
     Runner& runner;
     PictureTable& pictures;
-    int depth = 0; ///< Sequences whose frames run, within each other.
 };
 
 } // namespace ztsh
