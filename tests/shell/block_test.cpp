@@ -77,6 +77,18 @@ TEST(ReadBlock, KnowsABlockThatItsWordOpens)
     EXPECT_EQ(outcome.rest, "d ");
 }
 
+TEST(ReadBlock, KnowsABlockThatAClockRuns)
+{
+    Outcome outcome =
+        BlockOf("clock a at 1:00 do begin\nb\nend\n"
+                "Clock a onstop do Clock b onstop do Frames 1 2 begin\nend\n"
+                "Clock a onstop do b begin\nClock a begin\nend\nd\n",
+                true);
+
+    EXPECT_EQ(outcome.words, "clock b end Clock end Clock Clock");
+    EXPECT_EQ(outcome.rest, "d ");
+}
+
 TEST(ReadBlock, OtherWordsOpenNothingWithTheirLastWord)
 {
     Outcome outcome = BlockOf("Echo begin\nend\nd\n", true);

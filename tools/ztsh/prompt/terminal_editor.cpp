@@ -162,9 +162,15 @@ void TerminalEditor::RunDue()
     el_set(edit, EL_REFRESH);
 }
 
-/// Clears what is shown of the line, from its first row on.
+/// Clears what is shown of the line, from its first row on; where that cannot
+/// be done, leaves it behind.
 void TerminalEditor::hide_line()
 {
+    if (!CanRedraw(STDOUT_FILENO)) {
+        std::fputs("\n", stdout);
+        std::fflush(stdout);
+        return;
+    }
     const LineInfo* info = el_line(edit);
     std::string before = prompt_text + std::string(info->buffer, info->cursor);
     std::mbstate_t state = {};

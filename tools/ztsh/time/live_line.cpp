@@ -45,7 +45,7 @@ private:
 void ShowLive(const std::function<std::string()>& line,
               const std::function<bool()>& ended, Idle& idle)
 {
-    if (IsTerminal(input_descriptor) && IsTerminal(output_descriptor)) {
+    if (IsTerminal(input_descriptor) && CanRedraw(output_descriptor)) {
         KeysAtOnce keys(input_descriptor);
         IdleBelowLine below(idle, keys);
         while (!ended()) {

@@ -264,9 +264,11 @@ bool ClockWords::react(Clock& clock, const KvoStatement& statement,
         ZtError("Clock: every takes a time of a millisecond or more\n");
     else if (on_stop)
         clock.OnStop(std::move(reaction));
-    else if (takes_request() && every)
+    else if (!takes_request())
+        return true;
+    else if (every)
         clock.Every(milliseconds, std::move(reaction));
-    else if (takes_request())
+    else
         clock.At(time, std::move(reaction));
     return true;
 }
