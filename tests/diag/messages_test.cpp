@@ -115,6 +115,19 @@ TEST(Messages, KeepTheLastSystemFailureBeforeThem)
     EXPECT_EQ(trap.reports[0].system_error, ENOENT);
 }
 
+TEST(Messages, OfAFormatThatTheSystemRefusesComeOutAsItStands)
+{
+    const wchar_t unknown[] = {wchar_t(0x7fffffff), 0}; // is no character
+    ErrorTrap trap;
+
+    errno = ENOENT;
+    ZtWarning("%ls!\n", unknown);
+    errno = 0;
+
+    EXPECT_EQ(trap.Text(), "Warning: %ls!\n");
+    EXPECT_EQ(trap.reports[0].system_error, ENOENT); // not of the refusal
+}
+
 TEST(Messages, CountWhetherDroppedPrintedOrCaught)
 {
     const int before = ZtErr::count;
