@@ -111,6 +111,20 @@ TEST(image_memory, TheNearestPixelsAreNotTaken)
     EXPECT_EQ(out, literal::Zoom(picture, 2, 2, 3, 3));
 }
 
+TEST(image_memory, ANarrowerMapOfColumnsNeedsNoMore)
+{
+    static zt_image::ColumnMap map; // Its memory is never released.
+    map.columns(10, 5);
+    const int* columns = nullptr;
+
+    int failed =
+        WithEveryRequestFailing([&] { columns = map.columns(11, 3); }, [] {});
+
+    EXPECT_EQ(failed, 0);
+    EXPECT_EQ(std::vector<int>(columns, columns + 3),
+              (std::vector<int>{1, 5, 9}));
+}
+
 TEST(image_memory, AreasAreNotAveraged)
 {
     PixelList picture = {1, 2, 3, 4};
