@@ -8,7 +8,7 @@ import re
 import subprocess
 import sys
 
-# The codec's historic names, and what they call the pix reader.
+# Functions that go by plain names.
 CODEC = ("sizeofimage", "longimagedata", "longstoimage", "fastzoom",
          "longimageyuvdata", "decode_yuv", "ReadQuarnPix")
 FREE = ("OnSignal", "BSDsignal", "checktimer")
@@ -16,7 +16,10 @@ PUBLIC = re.compile(
     r"^((non-)?virtual thunk to |vtable for |typeinfo (name )?for |"
     r"guard variable for |VTT for |construction vtable for )?"
     r"(void |operator|bool |[\w:<>*& ]+ )?((Kvo|Zt)\w*|"
-    + "|".join(CODEC + FREE) + r")\b")
+    + "|".join(CODEC + FREE) + r")\b"
+    # Stream operators, and what the inline formulas report through.
+    r"|^operator(<<|>>)\(std::[io]stream&, Kvo"
+    r"|^zt_geometry::(illegal_|division_by_)")
 # Templates of the standard library that the compiler put in here.
 STANDARD = re.compile(r"^((\w+ )*for )?[\w:<>*&, ]*(std::|__gnu_cxx::)")
 
