@@ -172,15 +172,23 @@ class Time(unittest.TestCase):
 
     def test_what_is_due_is_run_above_the_live_line(self):
         terminal = self.terminal(
-            "-c", TICKING + "Echo tick; Clock b endless; "
-            "Clock b at 0.3 s do Clock a free; Clock a start; Clock b start; "
-            "Clock a watch; Echo on")
-        terminal.wait_for("\r\x1b[Ka: 00:00:00:0")
+            "-c", TICKING + "Echo tick; Clock a start; Clock a watch; Echo on")
+        terminal.wait_for("\r\x1b[Ka: 00:00:")
         for _ in range(3):
             terminal.wait_for("\r\x1b[Ktick\r\n")
-            terminal.wait_for("\r\x1b[Ka: 00:00:00:0")
-        terminal.wait_for("\r\x1b[Ka: forgotten\r\non\r\n")
+            terminal.wait_for("\r\x1b[Ka: 00:00:")
+        terminal.type("x")
+        terminal.wait_for("running, endless\r\non\r\n")
         self.assertEqual(terminal.end(), 0)
+
+    def test_what_is_watched_may_be_forgotten(self):
+        terminal = self.terminal(
+            "-c", "Beat start; Clock a from 0 to 0.1 s; Shuttle a in 0 out "
+            "1:00 repeat loop play; Clock a at 0.1 s do begin; Shuttle a free; "
+            "Clock a free; end; Clock a start; Shuttle a watch; Clock a watch")
+        terminal.wait_for("\r\x1b[Ka: forgotten\r\n")
+        self.assertEqual(terminal.end(), 1)
+        self.assertIn("no clock is named a", terminal.seen)
 
     def test_an_interrupt_ends_the_live_line(self):
         terminal = self.terminal(

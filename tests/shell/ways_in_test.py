@@ -125,10 +125,12 @@ class WaysIn(unittest.TestCase):
 
     def test_scripts_within_each_other_until_there_are_no_more_files(self):
         (self.directory / "deep.zt").write_text("Include deep.zt\n")
-        # The missing file comes first so that whatever a sanitizer has to look
-        # at for the first time is looked at while it can open files itself.
+        # Other files come first, and often enough that words are looked up in
+        # their index, so that whatever a sanitizer has to look at for the first
+        # time is looked at while it can open files itself.
         (self.directory / "a.zt").write_text(
-            "Include empty.zt\nInclude nofile\nInclude deep.zt\n")
+            "Include empty.zt; " * 100 + "\nInclude nofile\n"
+            "Include deep.zt\n")
         (self.directory / "empty.zt").write_text("")
 
         def few_files():
