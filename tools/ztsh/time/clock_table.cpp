@@ -145,6 +145,7 @@ std::vector<std::weak_ptr<const Statements>> ClockTable::Take()
     std::sort(taken.begin(), taken.end(),
               [](const Taken& a, const Taken& b) { return a.mark < b.mark; });
     std::vector<std::weak_ptr<const Statements>> statements;
+    statements.reserve(taken.size());
     for (Taken& each : taken)
         statements.push_back(std::move(each.statements));
     return statements;
