@@ -190,14 +190,28 @@ class Prompt(unittest.TestCase):
         self.assertEqual(terminal.seen.count("\u2580"), 20 * 5)
 
     def test_a_sequence_shows_how_far_it_is(self):
+        # Each frame ends when it may, so that however slow the machine is the
+        # line can be seen; the sleep outlasts the pause between two lines.
+        frame = ('System "sleep 0.15; until test -e go.$frame; '
+                 'do sleep 0.02; done"; Echo done $frame; ')
         for jobs in ("1", "2"):
-            terminal = self.start("--jobs", jobs, "-c", "Frames 1 3 begin; "
-                                  "System sleep 0.15; Echo done $frame; end")
+            terminal = self.start("--jobs", jobs, "-c",
+                                  "Frames 1 3 begin; " + frame + "end")
             terminal.wait_for("0/3")
+            self.let_end("0001")
             terminal.wait_for("done 0001\r\n")
             terminal.wait_for("left\x1b[K")
+            self.let_end("0002")
+            terminal.wait_for("\r\x1b[Kdone 0002\r\n")
+            terminal.wait_for("left\x1b[K")
+            self.let_end("0003")
             terminal.wait_for("\r\x1b[Kdone 0003\r\n")
             self.assertEqual(terminal.end(), 0)
+            for go in self.directory.glob("go.*"):
+                go.unlink()
+
+    def let_end(self, frame):
+        (self.directory / f"go.{frame}").touch()
 
     def test_the_line_of_a_silent_sequence_stays(self):
         for jobs in ("1", "2"):
@@ -218,7 +232,9 @@ class Prompt(unittest.TestCase):
         terminal = self.start()
         terminal.wait_for("ztsh> ")
         terminal.type("Include -\r")
-        terminal.wait_for("Include -\r\n")
+        # What is typed before the editor has let go of the terminal is read
+        # but not echoed.
+        terminal.wait_for("Include -\r")
         terminal.type("Echo in\r")
         terminal.wait_for("\nin\r\n")
         terminal.type("\x04")
