@@ -178,7 +178,6 @@ private:
     SLNode* step_over(SLNode* node, void* key, SLNode** update) const;
     int insert_after(SLNode** update, KvoObject* object);
     KvoObject* take_out(SLNode* node, SLNode** update);
-    void drop_empty_levels();
 
     Header first;
 };

@@ -1,21 +1,9 @@
 #include "KVO/KvoSkipList.h"
 
-#include "core/slab.h"
-#include "platform/random.h"
-
 #include <algorithm>
-#include <bit>
 #include <new>
 
-/// A skip list with nodes of random height. On every level the nodes are
-/// chained in ascending order; a walk starts on the top level and goes down a
-/// level whenever the next node is not before the key, so that the nodes it
-/// stopped at, one a level, are the ones to link behind.
-///
-/// A walk is bound by the memory it waits for: a node, its object and whatever
-/// the object's key is. So a node's forwards lie right behind it, nodes lie
-/// close together in slabs, and what can be asked next is fetched while the
-/// present object compares itself.
+#include "core/skip_nodes.h"
 
 namespace {
 
@@ -23,75 +11,9 @@ using SLNode = KvoSkipList::SLNode;
 
 constexpr int max_levels = KvoSkipList::max_levels;
 
+using Nodes = zt_core::NodeStore<SLNode, max_levels>;
+
 constinit bool random_seeded = false;
-
-// Nodes that wait to be used again, by level, chained by `forward[0]`; those
-// of all lists.
-constinit SLNode* spare_nodes[max_levels] = {};
-
-SLNode** forwards_behind(SLNode* node)
-{
-    return reinterpret_cast<SLNode**>(node + 1);
-}
-
-std::size_t node_bytes(int level)
-{
-    return sizeof(SLNode) +
-           static_cast<std::size_t>(level + 1) * sizeof(SLNode*);
-}
-
-SLNode* take_node(int level, KvoObject* object)
-{
-    if (SLNode* node = spare_nodes[level]) {
-        spare_nodes[level] = node->forward[0];
-        node->object = object;
-        return node;
-    }
-    void* piece = zt_core::pieces_are_separate
-                      ? ::operator new(node_bytes(level), std::nothrow)
-                      : zt_core::Slab::carve(node_bytes(level));
-    if (!piece)
-        return nullptr;
-    auto* node = static_cast<SLNode*>(piece);
-    *node = {object, forwards_behind(node), level};
-    return node;
-}
-
-void free_node(SLNode* node)
-{
-    if (zt_core::pieces_are_separate) {
-        ::operator delete(node);
-        return;
-    }
-    node->forward[0] = spare_nodes[node->level];
-    spare_nodes[node->level] = node;
-}
-
-int random_level()
-{
-    const auto bits =
-        static_cast<unsigned long>(zt_platform::Random::current().draw());
-    return std::max(std::countr_one(bits) - 1, 0);
-}
-
-/// Fetches what can be asked after `next`, which follows `node` on `level`: what
-/// lies below `node`, and the one behind `next`.
-///
-/// Always inlined, for g++ takes a function that only fetches for one without
-/// any effect and drops its calls.
-[[gnu::always_inline]] inline void fetch_ahead(SLNode* node, SLNode* next,
-                                               int level)
-{
-    if (level > 0) {
-        SLNode* below = forwards_behind(node)[level - 1];
-        __builtin_prefetch(below->object);
-        __builtin_prefetch(forwards_behind(below)[level - 1]);
-    }
-    if (const SLNode* behind = forwards_behind(next)[level])
-        __builtin_prefetch(behind->object);
-    if (level > 1)
-        __builtin_prefetch(forwards_behind(node)[level - 2]);
-}
 
 /// Compares the object of `node` with `key`; an empty slot is after every key.
 int compare(const SLNode* node, void* key)
@@ -150,7 +72,7 @@ void KvoSkipList::copy_nodes(const KvoSkipList& other)
     levels = other.levels;
     for (SLNode* from = other.header->forward[0]; from;
          from = from->forward[0]) {
-        SLNode* node = take_node(from->level, from->object);
+        SLNode* node = Nodes::take(from->level, from->object);
         if (!node)
             break;
         for (int i = 0; i <= node->level; ++i)
@@ -159,7 +81,7 @@ void KvoSkipList::copy_nodes(const KvoSkipList& other)
     }
     for (int i = 0; i < levels; ++i)
         last[i]->forward[i] = nullptr;
-    drop_empty_levels();
+    zt_core::drop_empty_levels(header, levels);
 }
 
 void KvoSkipList::Clear()
@@ -167,7 +89,7 @@ void KvoSkipList::Clear()
     SLNode* node = header->forward[0];
     while (node) {
         SLNode* next = node->forward[0];
-        free_node(node);
+        Nodes::give_back(node);
         node = next;
     }
     reset();
@@ -191,26 +113,12 @@ void KvoSkipList::CloneContents()
 KvoSkipList::SLNode* KvoSkipList::walk(const void* key, SLNode** update) const
 {
     auto* wanted = const_cast<void*>(key);
-    SLNode* node = header;
-    SLNode* stopped = nullptr;
-    bool equal = false;
-    for (int i = levels - 1; i >= 0; --i) {
-        SLNode* next = forwards_behind(node)[i];
-        while (next && next != stopped) {
-            fetch_ahead(node, next, i);
-            const int order = compare(next, wanted);
-            if (order >= 0) {
-                equal = order == 0;
-                break;
-            }
-            node = next;
-            next = forwards_behind(node)[i];
-        }
-        stopped = next;
-        update[i] = node;
-    }
-    current = node;
-    return equal ? stopped : nullptr;
+    const auto place =
+        zt_core::walk(header, levels, update, [wanted](const SLNode* node) {
+            return compare(node, wanted);
+        });
+    current = update[0];
+    return place.equal ? place.node : nullptr;
 }
 
 // Steps over the node behind `update[0]` and gives the next one if that is
@@ -245,19 +153,12 @@ int KvoSkipList::InsertUnique(KvoObject* object)
     return insert_after(update, object);
 }
 
-// A list grows by at most one level a node.
 int KvoSkipList::insert_after(SLNode** update, KvoObject* object)
 {
-    const int top = std::min({random_level(), levels, max_levels - 1});
-    SLNode* node = take_node(top, object);
+    SLNode* node =
+        zt_core::link_node<max_levels>(header, levels, update, object);
     if (!node)
         return 0;
-    if (top == levels)
-        update[levels++] = header;
-    for (int i = 0; i <= top; ++i) {
-        node->forward[i] = update[i]->forward[i];
-        update[i]->forward[i] = node;
-    }
     current = node;
     ++count;
     return 1;
@@ -284,20 +185,12 @@ KvoObject* KvoSkipList::RemoveKey(const void* key)
 
 KvoObject* KvoSkipList::take_out(SLNode* node, SLNode** update)
 {
-    for (int i = 0; i < levels && update[i]->forward[i] == node; ++i)
-        update[i]->forward[i] = node->forward[i];
+    zt_core::unlink_node(header, levels, update, node);
     current = update[0];
     KvoObject* object = node->object;
-    free_node(node);
+    Nodes::give_back(node);
     --count;
-    drop_empty_levels();
     return object;
-}
-
-void KvoSkipList::drop_empty_levels()
-{
-    while (levels >= 2 && !header->forward[levels - 1])
-        --levels;
 }
 
 KvoSkipList* KvoSkipList::Split(const void* key)
@@ -317,8 +210,8 @@ KvoSkipList* KvoSkipList::Split(const void* key)
         ++count;
     rest->count = total - count;
     rest->levels = levels;
-    drop_empty_levels();
-    rest->drop_empty_levels();
+    zt_core::drop_empty_levels(header, levels);
+    zt_core::drop_empty_levels(rest->header, rest->levels);
     return rest;
 }
 
@@ -348,10 +241,7 @@ KvoObject* KvoSkipList::Head() const
 
 KvoObject* KvoSkipList::Tail() const
 {
-    current = header;
-    for (int i = levels - 1; i >= 0; --i)
-        while (current->forward[i])
-            current = current->forward[i];
+    current = zt_core::last_node(header, levels);
     return current == header ? nullptr : current->object;
 }
 
