@@ -1,6 +1,6 @@
 #include "ZT/property.h"
 
-#include "support/FailingMalloc.h"
+#include "support/FailingMemory.h"
 #include "support/OtherLocale.h"
 
 #include <climits>
@@ -226,14 +226,12 @@ TEST(ZtPropList, SettingANameAgainMakesNoSecondEntry)
 {
     ZtPropList list;
     list.Set("m", "first");
-    int requests;
     {
-        FailingMalloc counting(INT_MAX);
+        FailingMemory after_one(1);
         list.Set("m", "second");
-        requests = counting.Requests();
     }
 
-    EXPECT_EQ(requests, 1);
+    EXPECT_FALSE(FailingMemory::Failed());
     EXPECT_STREQ(list.GetText("m"), "second");
 }
 
@@ -303,24 +301,20 @@ TEST(ZtPropList, DoesNotDependOnTheLocale)
 TEST(ZtPropertyWithoutMemory, KeepsItsText)
 {
     ZtProperty property("n", "former");
-    const auto check = [&] {
-        EXPECT_STREQ(property.name, "n");
-        EXPECT_STREQ(property.AsText(), "former");
-    };
+    {
+        FailingMemory none;
+        property.Set("other");
+        property.Set(5);
+    }
 
-    const int failed = WithEveryRequestFailing(
-        [&] {
-            property.Set("former");
-            property.Set("former");
-        },
-        check);
-
-    EXPECT_EQ(failed, 2);
+    EXPECT_TRUE(FailingMemory::Failed());
+    EXPECT_STREQ(property.name, "n");
+    EXPECT_STREQ(property.AsText(), "former");
 }
 
 TEST(ZtPropertyWithoutMemory, NewOneHasTheEmptyText)
 {
-    FailingMalloc memory(0);
+    FailingMemory none;
 
     ZtProperty property("n", 5);
     ZtProperty copy(property);
@@ -330,33 +324,34 @@ TEST(ZtPropertyWithoutMemory, NewOneHasTheEmptyText)
     EXPECT_STREQ(copy.AsText(), "");
 }
 
-// The name is either not there or has its value; no entry has a wrong name.
+// Each request for memory fails once, alone and with all after it. A name is
+// then either not there or has its value, and no entry has a wrong name.
 TEST(ZtPropListWithoutMemory, StaysAsItWas)
 {
-    std::unique_ptr<ZtPropList> list;
-    int added = 0;
+    bool failed = true;
+    int failures = 0;
+    for (long spared = 0; failed; ++spared) {
+        for (long how_many : {1L, -1L}) {
+            ZtPropList list;
+            list.Set("old", "one");
+            {
+                FailingMemory memory(spared, how_many);
+                list.Set("old", "two");
+                list.Set("new", "value");
+            }
+            failed = FailingMemory::Failed();
+            failures += failed;
 
-    const auto set = [&] {
-        list->Set("old", "two");
-        list->Set("new", "value");
-    };
-    const auto renew = [&] {
-        list = std::make_unique<ZtPropList>();
-        list->Set("old", "one");
-    };
-    renew();
-    const int failed = WithEveryRequestFailing(set, [&] {
-        const std::string old_text = list->GetText("old");
-        EXPECT_TRUE(old_text == "one" || old_text == "two") << old_text;
-        if (const char* text = list->GetText("new")) {
-            EXPECT_STREQ(text, "value");
-            ++added;
+            const bool renewed = spared > 0;
+            const bool added = !failed || (spared == 0 && how_many == 1);
+            EXPECT_STREQ(list.GetText("old"), renewed ? "two" : "one");
+            if (added)
+                EXPECT_STREQ(list.GetText("new"), "value") << spared;
+            else
+                EXPECT_EQ(list.GetText("new"), nullptr) << spared;
+            EXPECT_EQ(list.GetText(""), nullptr);
         }
-        EXPECT_EQ(list->GetText(""), nullptr);
-        renew();
-    });
+    }
 
-    EXPECT_GE(failed, 4);
-    EXPECT_EQ(added, 1); // when only the text of the old one failed
-    EXPECT_STREQ(list->GetText("new"), "value");
+    EXPECT_GE(failures, 8);
 }
