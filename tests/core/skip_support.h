@@ -51,4 +51,24 @@ inline std::vector<int> HeightsOf(const ZtSkipList& list)
     return heights;
 }
 
+/// Records of 10, 20 and 30 in a list.
+struct Tens
+{
+    explicit Tens(ZtSkipList::UniqueState state = ZtSkipList::Unique)
+        : list(ZtSkipList::CompareInt, state)
+    {
+        for (Record* record : {&middle, &low, &high})
+            list.Insert(record);
+    }
+
+    Record low{10}, middle{20}, high{30};
+    ZtSkipList list;
+};
+
+/// Gives the item under the cursor, null also for the header.
+inline void* UnderCursor(const ZtSkipList& list)
+{
+    return list.current ? list.current->item : nullptr;
+}
+
 #endif
