@@ -28,7 +28,7 @@ class ZT_API KvoStatement : public KvoTokenList
 public:
     /// Makes an empty statement or, if `text` is not null, one of the single
     /// word `text`, blanks and all: it is not split.
-    explicit KvoStatement(const char* text = 0);
+    explicit KvoStatement(const char* text = nullptr);
 
     /// Makes a statement of the words argv[0] to argv[argc - 1], unsplit.
     KvoStatement(int argc, const char* const* argv);

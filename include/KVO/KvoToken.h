@@ -70,7 +70,7 @@ public:
 
     /// Makes an empty token that reads with the action table of
     /// `special_characters`; null is the empty string.
-    explicit KvoToken(const char* special_characters = 0);
+    explicit KvoToken(const char* special_characters = nullptr);
 
     /// Copies text, quote character and action table, not the modified flag.
     KvoToken(const KvoToken& other);
@@ -170,8 +170,8 @@ public:
     /// after one of the latter. Null is the empty string.
     ///
     /// Owner: the list keeps copies of both.
-    explicit KvoTokenList(const char* special_characters = 0,
-                          const char* end_characters = 0);
+    explicit KvoTokenList(const char* special_characters = nullptr,
+                          const char* end_characters = nullptr);
 
     /// Copies the tokens as well; the modified flag starts at 0.
     KvoTokenList(const KvoTokenList& other);

@@ -37,6 +37,8 @@ ZtProperty::ZtProperty(const ZtProperty& other)
 
 ZtProperty& ZtProperty::operator=(const ZtProperty& other)
 {
+    if (this == &other)
+        return *this;
     KvoNamedObject::operator=(other);
     Set(other.text);
     return *this;

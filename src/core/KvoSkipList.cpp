@@ -117,7 +117,7 @@ KvoSkipList::SLNode* KvoSkipList::walk(const void* key, SLNode** update) const
         zt_core::walk(header, levels, update, [wanted](const SLNode* node) {
             return compare(node, wanted);
         });
-    current = update[0];
+    current = place.before;
     return place.equal ? place.node : nullptr;
 }
 

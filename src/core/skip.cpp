@@ -35,7 +35,7 @@ ZtSkipList::ZtSkipList(CompareFunction comparison, UniqueState state)
     : unique(state), compare(comparison ? comparison : CompareString)
 {
     static_assert(sizeof(Header) ==
-                  sizeof(SLNode) + max_levels * sizeof(SLNode*));
+                  sizeof(SLNode) + sizeof(SLNode* [max_levels]));
     if (!random_seeded) {
         random_seeded = true;
         zt_platform::Random::current().seed_from_time();
@@ -116,7 +116,7 @@ ZtSkipList::SLNode* ZtSkipList::walk(const void* key, SLNode** update) const
         zt_core::walk(first, levels, update, [this, key](const SLNode* node) {
             return compare(node->item, key);
         });
-    current = update[0];
+    current = place.before;
     return place.equal ? place.node : nullptr;
 }
 

@@ -120,8 +120,9 @@ template <class Node>
 template <class Node>
 struct Place
 {
-    Node* node; ///< The first node that is not before the key; may be null.
-    bool equal; ///< Whether that node is equal to the key.
+    Node* before; ///< The last node before the key, or the header.
+    Node* node;   ///< The first node that is not before the key; may be null.
+    bool equal;   ///< Whether that node is equal to the key.
 };
 
 /// Looks for a key's place; `order(node)` compares a node with the key. No node
@@ -149,7 +150,7 @@ Place<Node> walk(Node* header, int levels, Node** update, const Order& order)
         stopped = next;
         update[i] = node;
     }
-    return {stopped, equal};
+    return {node, stopped, equal};
 }
 
 /// Puts a new node of random height behind those in `update`; a list grows by
