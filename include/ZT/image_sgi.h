@@ -198,6 +198,27 @@ public:
     ///            (image_sgi.ResizeBestOfAnEmptyPictureMakesABlackOne).
     void ResizeBest(int new_width, int new_height);
 
+    /// Sends the picture to the frame store, as video frame `frame` of 720 x
+    /// 486 in 4:2:2, its two fields one after the other. A picture of any
+    /// other size than 648 x 486 is not sent.
+    ///
+    /// The frame store is a server on port 5333 of the host that the variable
+    /// QUARN_DDR_HOST names, in the environment or the installation. As long
+    /// as the lock file /ddr/ddr_lock exists the call waits, five seconds at a
+    /// time.
+    ///
+    /// Requires:  800 KiB of stack: nothing is allocated.
+    /// Units:     `frame` counts as the recorder does; any number is sent.
+    /// Reports:   prints lines on standard error: one at the start, one for
+    ///            each wait, one that begins with "ERROR:" for a failure, none
+    ///            at the end. Nothing else tells how it went.
+    /// Context:   must not run inside the beat, which may run meanwhile.
+    /// By design: neither the lock file nor a server that does not answer is
+    ///            ever given up (frame_store_server.ASlowAnswerIsWaitedFor).
+    /// By design: only the answer "BAD" is a refusal; any other four bytes are
+    ///            success (frame_store_server.AnyOtherFourBytesAreSuccess).
+    void ToDDR(int frame);
+
     int width;       ///< Pixels a row.
     int height;      ///< Rows.
     ZtPixel* pixels; ///< Object order, bottom row first; null when empty.
