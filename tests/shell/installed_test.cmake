@@ -4,10 +4,12 @@
 
 set(prefix ${BUILD}/installed_test)
 file(REMOVE_RECURSE ${prefix})
-execute_process(
-  COMMAND ${CMAKE_COMMAND} -DCMAKE_INSTALL_PREFIX=${prefix}
-          -P ${BUILD}/tools/ztsh/cmake_install.cmake
-  OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
+foreach(component runtime tools)
+  execute_process(
+    COMMAND ${CMAKE_COMMAND} --install ${BUILD} --prefix ${prefix}
+            --component ${component}
+    OUTPUT_QUIET COMMAND_ERROR_IS_FATAL ANY)
+endforeach()
 execute_process(
   COMMAND ${CMAKE_COMMAND} -E env --unset=LD_LIBRARY_PATH
           ${prefix}/${BINDIR}/ztsh -c "Echo installed"
