@@ -147,6 +147,12 @@ public:
     /// Returns: 1 if the file stays loaded, else 0.
     int ScanFile(const char* file);
 
+    /// Gives the directory that is being scanned, or was scanned last.
+    ///
+    /// Owner:   the catalog, until the next scan.
+    /// Returns: null before the first scan.
+    const char* Directory() const { return directory; }
+
     /// Finds the plug of that name; null is the empty name.
     ///
     /// Cursor:  of the names, on it; if there is none, before its place.
