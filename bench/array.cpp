@@ -96,20 +96,22 @@ void SumInts(benchmark::State& state)
     state.SetItemsProcessed(state.iterations() * count);
 }
 
-BENCHMARK(AppendInts)->Arg(100)->Arg(10000)->Arg(1000000)->Arg(10000000);
-BENCHMARK(AppendIntsBySize)->Arg(100)->Arg(10000)->Arg(1000000)->Arg(10000000);
+BENCHMARK(AppendInts)->Name("array_append/ours")->Arg(10000000);
+BENCHMARK(AppendIntsToVector)->Name("array_append/std::vector")->Arg(10000000);
+BENCHMARK(AppendInts)
+    ->Name("curve/array_append/ours")
+    ->RangeMultiplier(10)
+    ->Range(10, 100000000);
 BENCHMARK(AppendIntsToVector)
-    ->Arg(100)
-    ->Arg(10000)
-    ->Arg(1000000)
-    ->Arg(10000000);
-BENCHMARK(BumpInts)->Arg(10000)->Arg(1000000);
-BENCHMARK(AppendObjects)->Arg(100)->Arg(10000)->Arg(1000000)->Arg(10000000);
+    ->Name("curve/array_append/std::vector")
+    ->RangeMultiplier(10)
+    ->Range(10, 100000000);
+BENCHMARK(AppendIntsBySize)->Name("also/append_by_size/ours")->Arg(10000000);
+BENCHMARK(BumpInts)->Name("also/bump/ours")->Arg(1000000);
+BENCHMARK(AppendObjects)->Name("also/append_objects/ours")->Arg(10000000);
 BENCHMARK(AppendObjectsToVector)
-    ->Arg(100)
-    ->Arg(10000)
-    ->Arg(1000000)
+    ->Name("also/append_objects/std::vector")
     ->Arg(10000000);
-BENCHMARK(SumInts)->Arg(10000);
+BENCHMARK(SumInts)->Name("also/sum/ours")->Arg(10000);
 
 } // namespace

@@ -121,13 +121,24 @@ void ClearStdList(benchmark::State& state)
     }
 }
 
-BENCHMARK(Push)->Arg(10000)->Arg(1000000);
-BENCHMARK(PushToStdList)->Arg(10000)->Arg(1000000);
-BENCHMARK(Pop)->Arg(10000)->Arg(1000000);
-BENCHMARK(PopFromStdList)->Arg(10000)->Arg(1000000);
-BENCHMARK(ShortQueue);
-BENCHMARK(ShortQueueOfStdList);
-BENCHMARK(Clear)->Arg(1000000)->Iterations(20);
-BENCHMARK(ClearStdList)->Arg(1000000)->Iterations(20);
+BENCHMARK(Push)->Name("list_push/ours")->Arg(10000);
+BENCHMARK(PushToStdList)->Name("list_push/std::list")->Arg(10000);
+BENCHMARK(Pop)->Name("list_pop/ours")->Arg(10000);
+BENCHMARK(PopFromStdList)->Name("list_pop/std::list")->Arg(10000);
+BENCHMARK(ShortQueue)->Name("list_queue/ours");
+BENCHMARK(ShortQueueOfStdList)->Name("list_queue/std::list");
+BENCHMARK(Clear)->Name("list_clear/ours")->Arg(1000000)->Iterations(20);
+BENCHMARK(ClearStdList)
+    ->Name("list_clear/std::list")
+    ->Arg(1000000)
+    ->Iterations(20);
+BENCHMARK(Push)
+    ->Name("curve/list_push/ours")
+    ->RangeMultiplier(10)
+    ->Range(10, 10000000);
+BENCHMARK(PushToStdList)
+    ->Name("curve/list_push/std::list")
+    ->RangeMultiplier(10)
+    ->Range(10, 10000000);
 
 } // namespace

@@ -1,81 +1,87 @@
-// How fast are picture files read and written, against copying the pixels?
+// How fast are picture files read and written, against the literal codec, other
+// programs' codecs and copying the pixels?
 
 #include <ZT/image_sgi.h>
 
-#include <benchmark/benchmark.h>
+#include <chrono>
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
+#include <iterator>
+#include <map>
 #include <string>
+#include <sys/wait.h>
+#include <unistd.h>
 #include <vector>
+
+#include <benchmark/benchmark.h>
+
+#include "image/literal_codec.h"
+#include "require.h"
+#include "sample_pictures.h"
+#include "sgi_peers.h"
 
 namespace {
 
 constexpr int width = 2048;
 constexpr int height = 1536;
-constexpr std::size_t pixel_count = std::size_t{width} * height;
-
-/// A picture about as compressible as a photo: soft gradients with grain, and
-/// some areas that are flat.
-std::vector<ZtPixel> Photo()
-{
-    std::vector<ZtPixel> pixels;
-    std::uint32_t random = 1;
-    for (int y = 0; y < height; ++y)
-        for (int x = 0; x < width; ++x) {
-            random = random * 1664525 + 1013904223;
-            ZtPixel grain = random >> 28;
-            bool flat = y > height * 3 / 4 && x / 128 % 2;
-            ZtPixel value =
-                flat ? 0x40
-                     : static_cast<ZtPixel>(x / 16 + y / 16) % 240 + grain;
-            pixels.push_back(0xFF000000 | value << 16 | (255 - value) << 8 |
-                             (value ^ 0x55));
-        }
-    return pixels;
-}
 
 /// The files that are read, in a folder that goes at the end.
 class Files
 {
 public:
     Files()
-        : folder(std::filesystem::temp_directory_path() / "zt_bench_sgi_codec"),
-          photo(Photo())
+        : folder(std::filesystem::temp_directory_path() /
+                 ("zt_bench_sgi_codec." + std::to_string(getpid()))),
+          owner(getpid())
     {
         std::filesystem::create_directory(folder);
-        longstoimage(photo.data(), width, height, 3, Path("packed").c_str());
-        WriteVerbatim();
-        std::ofstream(Path("frame"), std::ios::binary)
-            << std::string(699840, '\x60');
-        std::ofstream pix(Path("pix"), std::ios::binary);
-        pix << std::string("\x08\0\x06\0\0\0\0\0\0\x18", 10);
-        for (std::size_t i = 0; i < pixel_count; i += 4)
-            pix << '\x04' << "\x10\x20" << static_cast<char>(i >> 8);
     }
 
-    ~Files() { std::filesystem::remove_all(folder); }
+    // Not by the children, which end before their parent.
+    ~Files()
+    {
+        if (getpid() == owner)
+            std::filesystem::remove_all(folder);
+    }
     Files(const Files&) = delete;
     Files& operator=(const Files&) = delete;
 
-    std::string Path(const char* name) const { return folder / name; }
+    std::string Path(const std::string& name) const { return folder / name; }
 
-private:
-    void WriteVerbatim() const
+    /// Gives a run-length file of this kind, written once.
+    std::string Packed(Kind kind, int channels, int columns = width,
+                       int rows = height) const
     {
+        const std::string path =
+            Path(std::to_string(static_cast<int>(kind)) + "_" +
+                 std::to_string(channels) + "_" + std::to_string(columns));
+        if (!std::filesystem::exists(path))
+            longstoimage(SamplePicture(kind, columns, rows).data(), columns,
+                         rows, channels, path.c_str());
+        return path;
+    }
+
+    std::string Verbatim() const
+    {
+        const std::string path = Path("plain");
+        if (std::filesystem::exists(path))
+            return path;
         std::string bytes("\x01\xDA\0\1\0\3\x08\0\x06\0\0\3", 12);
         bytes.resize(512);
+        const std::vector<ZtPixel> photo =
+            SamplePicture(Kind::Photo, width, height);
         for (int shift : {0, 8, 16})
             for (ZtPixel pixel : photo)
                 bytes += static_cast<char>(pixel >> shift);
-        std::ofstream(Path("plain"), std::ios::binary) << bytes;
+        std::ofstream(path, std::ios::binary) << bytes;
+        return path;
     }
 
+private:
     std::filesystem::path folder;
-
-public:
-    const std::vector<ZtPixel> photo;
+    pid_t owner;
 };
 
 const Files& TheFiles()
@@ -84,62 +90,206 @@ const Files& TheFiles()
     return files;
 }
 
-void CountPixels(benchmark::State& state, std::size_t count)
+std::string Bytes(const std::string& path)
 {
-    state.SetItemsProcessed(state.iterations() *
-                            static_cast<std::int64_t>(count));
+    std::ifstream in(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+void RequireSamePixels(const std::string& path)
+{
+    const literal::Picture there = literal::ReadSgi(Bytes(path));
+    ZtPixel* here = longimagedata(path.c_str());
+    Require(here && there.read &&
+                std::memcmp(here, there.pixels.data(),
+                            there.pixels.size() * sizeof(ZtPixel)) == 0,
+            "reading SGI files");
+    std::free(here);
+}
+
+void Read(benchmark::State& state, const std::string& path)
+{
+    RequireSamePixels(path);
+    for (auto _ : state) {
+        ZtPixel* pixels = longimagedata(path.c_str());
+        benchmark::DoNotOptimize(pixels);
+        std::free(pixels);
+    }
+}
+
+void ReadLiterally(benchmark::State& state, const std::string& path)
+{
+    for (auto _ : state) {
+        literal::Picture picture = literal::ReadSgi(Bytes(path));
+        benchmark::DoNotOptimize(picture.pixels.data());
+    }
+}
+
+void LoadObject(benchmark::State& state, const std::string& path)
+{
+    for (auto _ : state) {
+        ZtImageSGI image(path.c_str(), 0);
+        benchmark::DoNotOptimize(image.pixels);
+    }
 }
 
 void CopyPixels(benchmark::State& state)
 {
-    const std::vector<ZtPixel>& photo = TheFiles().photo;
+    const std::vector<ZtPixel> photo =
+        SamplePicture(Kind::Photo, width, height);
     std::vector<ZtPixel> copy(photo.size());
     for (auto _ : state) {
-        std::memcpy(copy.data(), photo.data(), pixel_count * sizeof(ZtPixel));
+        std::memcpy(copy.data(), photo.data(), photo.size() * sizeof(ZtPixel));
         benchmark::ClobberMemory();
     }
-    CountPixels(state, pixel_count);
 }
 
-void CopyPixelsToNewMemory(benchmark::State& state)
+void Peer(benchmark::State& state, bool (*read)(const char*),
+          const std::string& path)
 {
-    const std::vector<ZtPixel>& photo = TheFiles().photo;
-    for (auto _ : state) {
-        void* copy = std::malloc(pixel_count * sizeof(ZtPixel));
-        std::memcpy(copy, photo.data(), pixel_count * sizeof(ZtPixel));
-        benchmark::DoNotOptimize(copy);
-        std::free(copy);
-    }
-    CountPixels(state, pixel_count);
+    for (auto _ : state)
+        if (!read(path.c_str())) {
+            state.SkipWithError("the peer does not read this file");
+            break;
+        }
 }
 
-void Load(benchmark::State& state, const char* name, int type,
-          std::size_t count)
+/// Times one call in a process of its own, whose pages are all fresh.
+template <typename Work>
+void InFreshProcesses(benchmark::State& state, Work work)
 {
-    std::string path = TheFiles().Path(name);
     for (auto _ : state) {
-        ZtImageSGI image(path.c_str(), type);
-        benchmark::DoNotOptimize(image.pixels);
+        int ends[2];
+        Require(pipe(ends) == 0, "pipe");
+        const pid_t child = fork();
+        if (child == 0) {
+            const auto start = std::chrono::steady_clock::now();
+            work();
+            const std::chrono::duration<double> spent =
+                std::chrono::steady_clock::now() - start;
+            const double seconds = spent.count();
+            _exit(write(ends[1], &seconds, sizeof seconds) == sizeof seconds
+                      ? 0
+                      : 1);
+        }
+        double seconds = 0;
+        Require(read(ends[0], &seconds, sizeof seconds) == sizeof seconds,
+                "child");
+        waitpid(child, nullptr, 0);
+        close(ends[0]);
+        close(ends[1]);
+        state.SetIterationTime(seconds);
     }
-    CountPixels(state, count);
+}
+
+void FirstLoad(benchmark::State& state, const std::string& path)
+{
+    InFreshProcesses(state, [&path] {
+        benchmark::DoNotOptimize(longimagedata(path.c_str()));
+    });
+}
+
+void FirstLoadLiterally(benchmark::State& state, const std::string& path)
+{
+    InFreshProcesses(state, [&path] {
+        benchmark::DoNotOptimize(literal::ReadSgi(Bytes(path)));
+    });
 }
 
 void Write(benchmark::State& state)
 {
-    std::string path = TheFiles().Path("written");
-    int channels = static_cast<int>(state.range(0));
+    const std::vector<ZtPixel> photo =
+        SamplePicture(Kind::Photo, width, height);
+    const std::string path = TheFiles().Path("written");
     for (auto _ : state)
-        longstoimage(TheFiles().photo.data(), width, height, channels,
-                     path.c_str());
-    CountPixels(state, pixel_count);
+        longstoimage(photo.data(), width, height, 3, path.c_str());
+    Require(Bytes(path) == literal::WriteSgi(photo, width, height, 3),
+            "writing SGI files");
 }
 
-BENCHMARK(CopyPixels);
-BENCHMARK(CopyPixelsToNewMemory);
-BENCHMARK_CAPTURE(Load, RunLength, "packed", 0, pixel_count);
-BENCHMARK_CAPTURE(Load, Verbatim, "plain", 0, pixel_count);
-BENCHMARK_CAPTURE(Load, VideoFrame, "frame", 1, 720 * 486);
-BENCHMARK_CAPTURE(Load, Pix, "pix", 2, pixel_count);
-BENCHMARK(Write)->Arg(1)->Arg(3)->Arg(4);
+void WriteLiterally(benchmark::State& state)
+{
+    const std::vector<ZtPixel> photo =
+        SamplePicture(Kind::Photo, width, height);
+    const std::string path = TheFiles().Path("written_literally");
+    for (auto _ : state)
+        std::ofstream(path, std::ios::binary)
+            << literal::WriteSgi(photo, width, height, 3);
+}
+
+void WritePeer(benchmark::State& state, const SgiPeer& peer)
+{
+    const std::vector<ZtPixel> photo =
+        SamplePicture(Kind::Photo, width, height);
+    const std::string path = TheFiles().Path("written_by_peer.sgi");
+    SgiWriter writer = peer.make_writer(photo, width, height);
+    for (auto _ : state)
+        if (!writer(path.c_str())) {
+            state.SkipWithError("the peer does not write this file");
+            break;
+        }
+}
+
+void RegisterRead(const std::string& row, const std::string& path, bool limit)
+{
+    using benchmark::RegisterBenchmark;
+    const auto unit = benchmark::kMicrosecond;
+    RegisterBenchmark((row + "/ours").c_str(), Read, path)->Unit(unit);
+    RegisterBenchmark((row + "/literal").c_str(), ReadLiterally, path)
+        ->Unit(unit);
+    for (const SgiPeer& peer : SgiPeers())
+        RegisterBenchmark((row + "/" + peer.name).c_str(), Peer, peer.read,
+                          path)
+            ->Unit(unit);
+    if (limit)
+        RegisterBenchmark((row + "/limit").c_str(), CopyPixels)->Unit(unit);
+}
+
+void RegisterCurve()
+{
+    for (int side = 16; side <= 8192; side *= 2) {
+        const std::string path = TheFiles().Packed(Kind::Photo, 3, side, side);
+        const std::string size = std::to_string(side * side);
+        benchmark::RegisterBenchmark(("curve/sgi_read/ours/" + size).c_str(),
+                                     Read, path);
+        if (side <= 2048)
+            benchmark::RegisterBenchmark(
+                ("curve/sgi_read/literal/" + size).c_str(), ReadLiterally,
+                path);
+    }
+}
+
+[[maybe_unused]] const bool registered = [] {
+    using benchmark::RegisterBenchmark;
+    const auto unit = benchmark::kMicrosecond;
+    const std::map<Kind, std::string> kinds = {{Kind::Photo, "photo"},
+                                               {Kind::Rendered, "rendered"},
+                                               {Kind::Flat, "flat"}};
+    for (const auto& [kind, name] : kinds)
+        for (int channels : {3, 4})
+            RegisterRead(
+                "sgi_read_" + name + (channels == 3 ? "_rgb" : "_rgba"),
+                TheFiles().Packed(kind, channels), kind == Kind::Photo);
+    RegisterRead("sgi_read_verbatim", TheFiles().Verbatim(), false);
+
+    const std::string photo = TheFiles().Packed(Kind::Photo, 3);
+    RegisterBenchmark("sgi_first_load/ours", FirstLoad, photo)
+        ->UseManualTime()
+        ->Unit(unit);
+    RegisterBenchmark("sgi_first_load/literal", FirstLoadLiterally, photo)
+        ->UseManualTime()
+        ->Unit(unit);
+    RegisterBenchmark("object_load/ours", LoadObject, photo)->Unit(unit);
+    RegisterBenchmark("object_load/codec", Read, photo)->Unit(unit);
+    RegisterBenchmark("sgi_write/ours", Write)->Unit(unit);
+    RegisterBenchmark("sgi_write/literal", WriteLiterally)->Unit(unit);
+    for (const SgiPeer& peer : SgiPeers())
+        if (peer.make_writer)
+            RegisterBenchmark(("sgi_write/" + peer.name).c_str(), WritePeer,
+                              peer)
+                ->Unit(unit);
+    RegisterCurve();
+    return true;
+}();
 
 } // namespace

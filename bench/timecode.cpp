@@ -10,7 +10,11 @@
 #include <vector>
 
 #include <benchmark/benchmark.h>
+#ifdef ZT_BENCH_FMT
+#include <fmt/format.h>
+#endif
 
+#include "require.h"
 #include "support/LiteralTimecode.h"
 
 namespace {
@@ -57,18 +61,27 @@ void SplitLiteral(benchmark::State& state)
                             static_cast<std::int64_t>(many));
 }
 
+LiteralTimecode SplitOurs(std::int32_t ticks, int fps)
+{
+    LiteralTimecode code;
+    int hours;
+    code.hours = KvoTime::FromTicks(ticks).Timecode(
+        &hours, &code.minutes, &code.seconds, &code.frames, fps);
+    return code;
+}
+
 void Split(benchmark::State& state)
 {
     const std::vector<std::int32_t>& times = AnyTimes();
     auto fps = static_cast<int>(state.range(0));
+    for (const std::int32_t ticks : times)
+        Require(SplitOurs(ticks, fps) == LiteralSplit(ticks, fps),
+                "timecode split");
     for (auto round : state) {
         (void)round;
         for (const std::int32_t ticks : times) {
             benchmark::DoNotOptimize(fps);
-            LiteralTimecode code;
-            int hours;
-            code.hours = KvoTime::FromTicks(ticks).Timecode(
-                &hours, &code.minutes, &code.seconds, &code.frames, fps);
+            LiteralTimecode code = SplitOurs(ticks, fps);
             benchmark::DoNotOptimize(code);
         }
     }
@@ -92,6 +105,25 @@ void TextSnprintf(benchmark::State& state)
     state.SetItemsProcessed(state.iterations() *
                             static_cast<std::int64_t>(many));
 }
+
+#ifdef ZT_BENCH_FMT
+void TextFmt(benchmark::State& state)
+{
+    const std::vector<std::int32_t>& times = AnyTimes();
+    char text[64];
+    for (auto round : state) {
+        (void)round;
+        for (const std::int32_t ticks : times) {
+            const LiteralTimecode code = LiteralSplit(ticks, 30);
+            *fmt::format_to(text, "{:02}:{:02}:{:02}:{:02}", code.hours,
+                            code.minutes, code.seconds, code.frames) = '\0';
+            benchmark::DoNotOptimize(text);
+        }
+    }
+    state.SetItemsProcessed(state.iterations() *
+                            static_cast<std::int64_t>(many));
+}
+#endif
 
 void TextLiteral(benchmark::State& state)
 {
@@ -128,8 +160,15 @@ void TextWrite(benchmark::State& state)
 }
 } // namespace
 
-BENCHMARK(SplitLiteral)->Arg(30)->Arg(25)->Arg(7);
-BENCHMARK(Split)->Arg(30)->Arg(25)->Arg(7);
-BENCHMARK(TextSnprintf);
-BENCHMARK(TextLiteral);
-BENCHMARK(TextWrite);
+BENCHMARK(Split)->Name("timecode_split/ours")->Arg(30);
+BENCHMARK(SplitLiteral)->Name("timecode_split/literal")->Arg(30);
+BENCHMARK(Split)->Name("timecode_split_25/ours")->Arg(25);
+BENCHMARK(SplitLiteral)->Name("timecode_split_25/literal")->Arg(25);
+BENCHMARK(Split)->Name("timecode_split_7/ours")->Arg(7);
+BENCHMARK(SplitLiteral)->Name("timecode_split_7/literal")->Arg(7);
+BENCHMARK(TextWrite)->Name("timecode_text/ours");
+BENCHMARK(TextLiteral)->Name("timecode_text/literal");
+BENCHMARK(TextSnprintf)->Name("timecode_text/snprintf");
+#ifdef ZT_BENCH_FMT
+BENCHMARK(TextFmt)->Name("timecode_text/fmt");
+#endif

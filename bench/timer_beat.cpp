@@ -14,25 +14,27 @@
 namespace {
 
 constexpr int timer_count = 6;
-constexpr int records_a_timer = 10;
 
 void Nothing(ZtTimer*, void*) {}
 
-/// Six running timers with ten records each, and the beat's handler in place.
+/// Six running timers with their records, and the beat's handler in place.
 class BusyBeat
 {
 public:
-    explicit BusyBeat(bool all_due)
+    BusyBeat(bool all_due, int records_a_timer)
     {
         for (auto& timer : timers) {
             timer = std::make_unique<ZtTimer>();
-            for (int record = 0; record < records_a_timer; ++record)
+            for (int record = 0; record < records_a_timer; ++record) {
                 if (all_due)
                     timer->post_repeat(Nothing, nullptr, 0);
                 else if (record % 2)
                     timer->post_trigger(Nothing, nullptr, KvoTime::FOREVER);
                 else
                     timer->post_repeat(Nothing, nullptr, 1000000000);
+                if (ZtTimerBeat::defer_op_count == ZtTimerBeat::defer_op_limit)
+                    ZtTimerBeat::execute_ops();
+            }
             timer->start();
             ZtTimerBeat::execute_ops();
         }
@@ -59,15 +61,31 @@ void RaiseAtEmptyHandler(benchmark::State& state)
     for (auto _ : state)
         raise(SIGALRM);
 }
-BENCHMARK(RaiseAtEmptyHandler);
+BENCHMARK(RaiseAtEmptyHandler)->Name("beat_walk/limit");
 
+template <bool AllDue>
 void Beat(benchmark::State& state)
 {
-    const BusyBeat busy(state.range(0) != 0);
+    const BusyBeat busy(AllDue, 10);
     for (auto _ : state)
         raise(SIGALRM);
 }
-BENCHMARK(Beat)->ArgName("all_due")->Arg(0)->Arg(1);
+BENCHMARK(Beat<false>)->Name("beat_walk/ours");
+BENCHMARK(Beat<true>)->Name("also/beat_all_due/ours");
+
+void GrowingBeat(benchmark::State& state)
+{
+    const BusyBeat busy(false, static_cast<int>(state.range(0)) / timer_count);
+    for (auto _ : state)
+        raise(SIGALRM);
+}
+BENCHMARK(GrowingBeat)
+    ->Name("curve/beat/ours")
+    ->Arg(6)
+    ->Arg(60)
+    ->Arg(600)
+    ->Arg(6000)
+    ->Arg(60000);
 
 void BeatWithoutTimers(benchmark::State& state)
 {
@@ -77,7 +95,7 @@ void BeatWithoutTimers(benchmark::State& state)
     ZtTimerBeat::stop();
     raise(SIGALRM);
 }
-BENCHMARK(BeatWithoutTimers);
+BENCHMARK(BeatWithoutTimers)->Name("also/beat_without_timers/ours");
 
 void MaskAndUnmask(benchmark::State& state)
 {
@@ -89,7 +107,7 @@ void MaskAndUnmask(benchmark::State& state)
         pthread_sigmask(SIG_SETMASK, &before, nullptr);
     }
 }
-BENCHMARK(MaskAndUnmask);
+BENCHMARK(MaskAndUnmask)->Name("beat_queue/limit");
 
 /// Empties the queue whenever it is full, for the price of a comparison.
 void EmptyWhenFull()
@@ -108,7 +126,7 @@ void QueueRequest(benchmark::State& state)
     }
     ZtTimerBeat::defer_op_count = 0;
 }
-BENCHMARK(QueueRequest);
+BENCHMARK(QueueRequest)->Name("beat_queue/ours");
 
 void PostAndUnpost(benchmark::State& state)
 {
@@ -122,6 +140,6 @@ void PostAndUnpost(benchmark::State& state)
     }
     ZtTimerBeat::execute_ops();
 }
-BENCHMARK(PostAndUnpost);
+BENCHMARK(PostAndUnpost)->Name("also/post_and_unpost/ours");
 
 } // namespace
