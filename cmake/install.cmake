@@ -94,6 +94,12 @@ install(FILES ${PROJECT_BINARY_DIR}/zt_util2.pc
 
 # tools
 zt_targets_of(tools EXECUTABLE tools)
+get_property(with_pages GLOBAL PROPERTY ZT_TOOLS_WITH_PAGES)
+foreach(tool IN LISTS tools)
+  if(NOT tool IN_LIST with_pages)
+    message(FATAL_ERROR "${tool} has no man page: see tools/pages/README.md")
+  endif()
+endforeach()
 if(tools)
   zt_find_library_from(${CMAKE_INSTALL_BINDIR} ${tools})
   install(TARGETS ${tools}

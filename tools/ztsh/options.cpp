@@ -1,6 +1,7 @@
 #include "options.h"
 
 #include "exit_code.h"
+#include "pages/command.h"
 
 #include <iostream>
 #include <thread>
@@ -39,11 +40,11 @@ int cores()
 
 } // namespace
 
-Options ReadOptions(int argc, const char* const* argv)
+void AddOptions(CLI::App& app, Options& options)
 {
-    Options options;
     options.settings.jobs = cores();
-    CLI::App app("Runs scripts of the command language on pictures.", "ztsh");
+    app.name("ztsh");
+    app.description("Runs scripts of the command language on pictures.");
     app.footer(footer);
     app.set_version_flag("--version", "ztsh " ZTSH_VERSION);
     app.add_option("script", options.scripts,
@@ -66,6 +67,14 @@ Options ReadOptions(int argc, const char* const* argv)
                    "itself (default: the cores)")
         ->option_text("N")
         ->check(CLI::Range(1, most_jobs_allowed));
+    zt_pages::AddPageOption(app, options.page);
+}
+
+Options ReadOptions(int argc, const char* const* argv)
+{
+    Options options;
+    CLI::App app;
+    AddOptions(app, options);
     try {
         app.parse(argc, argv);
     } catch (const CLI::Success& done) {

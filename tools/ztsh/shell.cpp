@@ -1,5 +1,6 @@
 #include "shell.h"
 
+#include "pages.h"
 #include "pictures/picture_files.h"
 #include "prompt/history_file.h"
 #include "prompt/line_editor.h"
@@ -27,6 +28,10 @@ Shell::Shell(const Settings& settings)
 
 int Shell::Run(const Options& options)
 {
+    if (!options.page.empty()) {
+        WritePage(std::cout, options.page, runner.dispatcher);
+        return std::cout.flush() ? 0 : ExitCannotWrite;
+    }
     CatchStopSignals();
     for (const std::string& text : options.texts)
         if (!runner.Stopping())
