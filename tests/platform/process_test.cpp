@@ -5,14 +5,22 @@
 #include <filesystem>
 #include <string>
 
+#include <fcntl.h>
 #include <gtest/gtest.h>
+#include <sys/resource.h>
+#include <sys/stat.h>
 #include <sys/time.h>
 #include <sys/wait.h>
+#include <unistd.h>
 
 #include "support/CapturedStderr.h"
+#include "support/FakeProcesses.h"
+#include "support/InAChild.h"
 #include "support/TempDir.h"
 
 using zt_platform::Processes;
+using zt_platform::ShellLine;
+using zt_platform::ShellOutput;
 
 namespace {
 
@@ -189,6 +197,226 @@ TEST(Processes, AHandlerThatCollectsChildrenDoesNotTakeOurs)
     EXPECT_EQ(WEXITSTATUS(Shell("exit 6")), 6);
 }
 
+namespace {
+
+std::string OutputOf(const std::string& command)
+{
+    ShellOutput output(command.c_str());
+    std::string text;
+    char piece[7];
+    while (const std::size_t bytes = output.read(piece, sizeof piece))
+        text.append(piece, bytes);
+    return text;
+}
+
+int OpenFiles()
+{
+    int count = 0;
+    for ([[maybe_unused]] const auto& file :
+         std::filesystem::directory_iterator("/proc/self/fd"))
+        ++count;
+    return count;
+}
+
+} // namespace
+
+TEST(ShellOutput, IsReadToTheEnd)
+{
+    const int before = OpenFiles();
+
+    EXPECT_EQ(OutputOf("echo one; echo two three"), "one\ntwo three\n");
+    EXPECT_EQ(OutputOf("head -c 200000 /dev/zero").size(), 200000u);
+    EXPECT_EQ(OutputOf(":"), "");
+    EXPECT_EQ(OpenFiles(), before);
+    EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), -1);
+    EXPECT_EQ(errno, ECHILD);
+}
+
+TEST(ShellOutput, OfALineThatBeginsWithAMinusIsNoOption)
+{
+    CapturedStderr quiet;
+
+    EXPECT_EQ(OutputOf("-x; echo on"), "on\n");
+}
+
+TEST(ShellOutput, IsReadToTheEndThoughNobodyWantsIt)
+{
+    TempDir directory;
+
+    {
+        ShellOutput output(
+            ("head -c 200000 /dev/zero; echo end > " + directory.Path("end"))
+                .c_str());
+        EXPECT_TRUE(output.was_started());
+    }
+
+    EXPECT_EQ(directory.Read("end"), "end\n");
+}
+
+TEST(ShellOutput, IsWaitedForEvenWhenItIsClosedEarly)
+{
+    TempDir directory;
+
+    OutputOf("exec >&-; sleep 0.03; echo end > " + directory.Path("end"));
+
+    EXPECT_EQ(directory.Read("end"), "end\n");
+}
+
+TEST(ShellOutput, IsWholeThoughOurAlarmInterrupts)
+{
+    SignalsKept kept(SIGALRM);
+    struct sigaction action = {};
+    action.sa_handler = Count; // without SA_RESTART: the reading is cut short
+    sigaction(SIGALRM, &action, nullptr);
+    calls = 0;
+    itimerval every_millisecond = {{0, 1000}, {0, 1000}}, off = {};
+    setitimer(ITIMER_REAL, &every_millisecond, nullptr);
+
+    const std::string text = OutputOf("sleep 0.03; echo whole; sleep 0.01");
+
+    setitimer(ITIMER_REAL, &off, nullptr);
+    EXPECT_EQ(text, "whole\n");
+    EXPECT_GT(calls, 0);
+}
+
+TEST(ShellOutput, ItsLineFindsTheAlarmNeitherIgnoredNorHeldBack)
+{
+    SignalsKept kept(SIGALRM);
+    SignalsKept kept_too(SIGHUP);
+    signal(SIGALRM, SIG_IGN);
+    signal(SIGHUP, SIG_IGN); // as `nohup` does
+    sigset_t all;
+    sigfillset(&all);
+    sigprocmask(SIG_BLOCK, &all, nullptr);
+
+    const std::string ignored = OutputOf("grep SigIgn /proc/self/status");
+    const std::string held = OutputOf("grep SigBlk /proc/self/status");
+
+    const unsigned long ignored_bits =
+        std::stoul(ignored.substr(8), nullptr, 16);
+    EXPECT_EQ(ignored_bits & Bit(SIGALRM), 0u);
+    EXPECT_NE(ignored_bits & Bit(SIGHUP), 0u);
+    EXPECT_EQ(std::stoul(held.substr(8), nullptr, 16), 0u);
+}
+
+TEST(ShellOutput, OfALineThatIsKilledIsWhatItWrote)
+{
+    EXPECT_EQ(OutputOf("echo before; kill -KILL $$"), "before\n");
+}
+
+TEST(ShellOutput, OtherCommandsDoNotHoldThePipe)
+{
+    const std::string held_alone = OutputOf("ls /proc/self/fd");
+    ShellLine line;
+    ASSERT_TRUE(Processes::current().start_shell("echo one", line));
+    const std::string held_beside = OutputOf("ls /proc/self/fd");
+    const int flags = fcntl(line.pipe, F_GETFD);
+    Processes::current().end_shell(line);
+
+    EXPECT_EQ(held_beside, held_alone);
+    EXPECT_EQ(flags & FD_CLOEXEC, FD_CLOEXEC);
+    EXPECT_EQ(line.pipe, -1);
+}
+
+TEST(ShellOutput, ComesThroughWhenOurOwnOutputIsClosedInAChild)
+{
+    RunInAChild([] {
+        close(0);
+        close(1);
+        EXPECT_EQ(OutputOf("echo one"), "one\n");
+    });
+}
+
+TEST(ShellOutput, IsEmptyWhenNothingCanBeStarted)
+{
+    ShellOutput none(nullptr);
+    ShellOutput too_long((": " + std::string(10000000, 'x')).c_str());
+    char piece[4];
+
+    EXPECT_FALSE(none.was_started());
+    EXPECT_EQ(none.read(piece, sizeof piece), 0u);
+    EXPECT_FALSE(too_long.was_started());
+    EXPECT_EQ(too_long.read(piece, sizeof piece), 0u);
+}
+
+TEST(ShellOutput, TellsWhyItCannotBeStarted)
+{
+    ShellLine line;
+    const int before = OpenFiles();
+
+    EXPECT_FALSE(Processes::current().start_shell(nullptr, line));
+    EXPECT_EQ(errno, EINVAL);
+    EXPECT_FALSE(Processes::current().start_shell(
+        (": " + std::string(10000000, 'x')).c_str(), line));
+    EXPECT_EQ(errno, E2BIG);
+    EXPECT_EQ(line.pipe, -1);
+    EXPECT_EQ(OpenFiles(), before);
+}
+
+TEST(ShellOutput, CannotBeStartedWithoutFilesLeftInAChild)
+{
+    RunInAChild([] {
+        // Room for one file more, but a pipe has two ends.
+        const int next = dup(2);
+        close(next);
+        rlimit files = {static_cast<rlim_t>(next) + 1,
+                        static_cast<rlim_t>(next) + 1};
+        setrlimit(RLIMIT_NOFILE, &files);
+        ShellLine line;
+        EXPECT_FALSE(Processes::current().start_shell("echo", line));
+        EXPECT_EQ(errno, EMFILE);
+        EXPECT_EQ(dup(2), next);
+    });
+}
+
+TEST(ShellOutput, IsTheSameInPiecesAndPastInterruptions)
+{
+    FakeProcesses processes;
+    processes.output = "one two three four";
+    processes.most_at_once = 1;
+    processes.interrupts = true;
+
+    EXPECT_EQ(OutputOf("anything"), "one two three four");
+    EXPECT_EQ(processes.running, 0);
+}
+
+TEST(ShellOutput, EndsAtAFault)
+{
+    FakeProcesses processes;
+    processes.output = "one two three four";
+    processes.read_ends = 5;
+
+    EXPECT_EQ(OutputOf("anything"), "one t");
+    EXPECT_EQ(processes.running, 0);
+}
+
+TEST(Processes, AProgramIsARegularFileThatMayBeExecuted)
+{
+    namespace fs = std::filesystem;
+    TempDir directory;
+    const std::string file = directory.Write("file", "");
+    const std::string link = directory.Path("link");
+    fs::create_symlink(file, link);
+    fs::create_directory(directory.Path("folder"));
+    mkfifo(directory.Path("fifo").c_str(), 0777);
+    Processes& processes = Processes::current();
+
+    EXPECT_FALSE(processes.is_program(file.c_str()));
+    fs::permissions(file, fs::perms::owner_all);
+    EXPECT_TRUE(processes.is_program(file.c_str()));
+    EXPECT_TRUE(processes.is_program(link.c_str()));
+    EXPECT_FALSE(processes.is_program(directory.Path("folder").c_str()));
+    EXPECT_FALSE(processes.is_program(directory.Path("fifo").c_str()));
+    EXPECT_FALSE(processes.is_program(directory.Path("none").c_str()));
+    EXPECT_FALSE(processes.is_program(""));
+    EXPECT_FALSE(processes.is_program(nullptr));
+}
+
+TEST(Processes, ATestHasNoRaisedRights)
+{
+    EXPECT_FALSE(Processes::current().has_raised_rights());
+}
+
 TEST(Processes, ChangesTheDirectory)
 {
     const auto before = std::filesystem::current_path();
@@ -208,20 +436,17 @@ TEST(Processes, ChangesTheDirectory)
 
 TEST(Processes, InstallGivesBackWhatWasInUse)
 {
-    class Others : public Processes
-    {
-    public:
-        int run_shell(const char*) override { return 7; }
-        bool change_directory(const char*) override { return true; }
-    };
-    Others others;
+    Processes* const system = &Processes::current();
+    FakeProcesses others;
+    others.result = 7;
 
-    Processes* const before = Processes::install(&others);
     const int answer = Shell("anything");
-    Processes* const installed = Processes::install(before);
+    Processes* const installed = Processes::install(nullptr);
+    Processes* const in_use = &Processes::current();
+    Processes* const before = Processes::install(&others);
 
     EXPECT_EQ(answer, 7);
-    EXPECT_EQ(before, nullptr);
     EXPECT_EQ(installed, &others);
-    EXPECT_NE(&Processes::current(), &others);
+    EXPECT_EQ(in_use, system);
+    EXPECT_EQ(before, nullptr);
 }
