@@ -100,7 +100,7 @@ public:
     ZtPlugCatalog& operator=(const ZtPlugCatalog&) = delete;
 
     /// Deletes the plugs with their objects, then closes the shared objects,
-    /// the one opened last first.
+    /// the one that was kept last first.
     ///
     /// Requires: whatever a plug-in's objects have made is deleted before, and
     ///           nothing calls into the plug-ins any more.
@@ -221,13 +221,14 @@ private:
     struct Candidate;
 
     bool load(const char* file);
+    void open(Candidate& candidate);
     bool adopt(Candidate& candidate);
-    bool run_entry(Candidate& candidate);
-    void set_directory(const char* dir);
+    void keep(void* handle);
+    bool set_directory(const char* dir);
 
     KvoObjList shared_objects; ///< Of `DSONode`, the newest first, owned.
     KvoSkipList plugs;         ///< Of `Plug`, owned.
-    char* id;
+    char* own_id;
     char* directory;    ///< Being scanned, or scanned last; null before.
     Candidate* running; ///< The plug-in whose entry runs, or null.
 };

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <cstring>
-#include <initializer_list>
 #include <limits>
 #include <memory>
 #include <new>
@@ -11,11 +10,14 @@
 
 #include "ZT/util.h"
 
+#include "core/joined_text.h"
 #include "core/text_stream.h"
 #include "core/write_text.h"
 #include "platform/files.h"
 
 namespace {
+using zt_core::joined_text;
+
 constexpr int no_number = 999999;
 
 const char* or_empty(const char* text)
@@ -41,23 +43,6 @@ int all_digits(const char* begin, const char* end)
         value = value > (most - digit) / 10 ? most : value * 10 + digit;
     }
     return value;
-}
-
-// The pieces in one text; null when there is no memory. The arguments of an
-// edit may be temporary strings, so edits make none before they have used them.
-std::unique_ptr<char[]> joined(std::initializer_list<std::string_view> pieces)
-{
-    std::size_t length = 0;
-    for (const std::string_view piece : pieces)
-        length += piece.size();
-    std::unique_ptr<char[]> text(new (std::nothrow) char[length + 1]);
-    char* end = text.get();
-    if (!end)
-        return text;
-    for (const std::string_view piece : pieces)
-        end = std::copy(piece.begin(), piece.end(), end);
-    *end = '\0';
-    return text;
 }
 
 int accessible(const char* path, zt_platform::Access access)
@@ -109,7 +94,8 @@ const char* ZtFilePath::Root() const
     if (point == std::string_view::npos)
         return FullPath();
     const auto head = parts_joined(Count() - 1);
-    const auto root = joined({or_empty(head.get()), last.substr(0, point)});
+    const auto root =
+        joined_text({or_empty(head.get()), last.substr(0, point)});
     return ZtNewTempString(root.get());
 }
 
@@ -170,7 +156,7 @@ void ZtFilePath::AddExtension(const char* extension, int force)
 void ZtFilePath::ReplaceHead(const char* head)
 {
     const char* const tail = ends_with_slash() ? "" : last_part();
-    const auto path = joined({or_empty(head), head ? "/" : "", tail});
+    const auto path = joined_text({or_empty(head), head ? "/" : "", tail});
     if (path)
         read_text(path.get());
 }
@@ -259,11 +245,13 @@ const char* ZtFilePath::text_of(int parts) const
 }
 
 // Gives the last name, which is to be `root` without extension, an extension;
-// or makes a name of the extension alone where there is no name.
+// or makes a name of the extension alone where there is no name. The arguments
+// may be temporary strings, so none is made before they have been used.
 void ZtFilePath::put_extension(std::string_view root, const char* extension)
 {
     const bool has_name = Count() != 0 && !ends_with_slash();
-    const auto name = joined({has_name ? root : "", ".", or_empty(extension)});
+    const auto name =
+        joined_text({has_name ? root : "", ".", or_empty(extension)});
     if (!name)
         return;
     if (has_name)

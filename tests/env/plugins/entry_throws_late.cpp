@@ -1,0 +1,11 @@
+#include "env/plugins/told.h"
+
+namespace {
+ToldClosing closing("entry_throws_late.so closed");
+}
+
+ZT_PLUGIN("Test:2.1", catalog)
+{
+    catalog->AddPlug("late", new ToldObject("late deleted"));
+    throw 7;
+}

@@ -1,0 +1,10 @@
+#include "env/plugins/told.h"
+
+namespace {
+ToldClosing closing("good.so closed");
+}
+
+ZT_PLUGIN("Test:2.1", catalog)
+{
+    catalog->AddPlug("good", new ToldObject("good deleted"));
+}
