@@ -210,8 +210,8 @@ public:
     /// Requires:  800 KiB of stack: nothing is allocated.
     /// Units:     `frame` counts as the recorder does; any number is sent.
     /// Reports:   prints lines on standard error: one at the start, one for
-    ///            each wait, one that begins with "ERROR:" for a failure, none
-    ///            at the end. Nothing else tells how it went.
+    ///            each wait, one for a failure, none for success. Nothing else
+    ///            tells how it went.
     /// Context:   must not run inside the beat, which may run meanwhile.
     /// By design: neither the lock file nor a server that does not answer is
     ///            ever given up (frame_store_server.ASlowAnswerIsWaitedFor).

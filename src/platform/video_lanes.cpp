@@ -1,0 +1,99 @@
+#include "platform/video_lanes.h"
+
+#include "platform/x86/video_lanes_avx2.h"
+
+namespace zt_platform {
+
+namespace {
+
+struct PlainLanes final : VideoLanes
+{};
+
+constinit const PlainLanes plain_lanes;
+constinit const VideoLanes* in_use = nullptr; ///< Null before the first use.
+
+/// The channels of a pixel as numbers.
+struct Channels
+{
+    explicit Channels(std::uint32_t pixel)
+        : red(static_cast<int>(pixel >> 24)),
+          green(static_cast<int>(pixel >> 16 & 0xFF)),
+          blue(static_cast<int>(pixel >> 8 & 0xFF))
+    {}
+
+    int weighed(const ChannelWeights& weights) const
+    {
+        return weights.red * red + weights.green * green + weights.blue * blue;
+    }
+
+    int red;
+    int green;
+    int blue;
+};
+
+/// Adds the fraction that was carried and carries the new one.
+///
+/// Returns: the whole part of the sum and the offset, modulo 256.
+unsigned char whole_part(int sum, std::uint32_t& fraction, int offset)
+{
+    sum += static_cast<int>(fraction);
+    fraction = static_cast<std::uint32_t>(sum) & 0xFFFF;
+    return static_cast<unsigned char>((sum >> 16) + offset);
+}
+
+} // namespace
+
+const char* VideoLanes::name() const
+{
+    return "plain";
+}
+
+void VideoLanes::mix(const std::uint32_t* pixels, unsigned char* groups,
+                     std::size_t pairs, const VideoMix& video,
+                     VideoCarry& carry) const
+{
+    VideoCarry now = carry;
+    for (std::size_t pair = 0; pair < pairs; ++pair) {
+        const Channels first(pixels[2 * pair]);
+        const Channels second(pixels[2 * pair + 1]);
+        unsigned char* group = groups + 4 * pair;
+        for (int i = 0; i < 2; ++i) {
+            const VideoMix::Chroma& chroma = video.chroma[i];
+            const int before = now.second[i];
+            now.second[i] = second.weighed(chroma.second);
+            group[2 * i] =
+                whole_part(before + first.weighed(chroma.first) + now.second[i],
+                           now.chroma[i], chroma.offset);
+        }
+        group[1] =
+            whole_part(first.weighed(video.luma), now.luma, video.luma_offset);
+        group[3] =
+            whole_part(second.weighed(video.luma), now.luma, video.luma_offset);
+    }
+    carry = now;
+}
+
+const VideoLanes& VideoLanes::plain()
+{
+    return plain_lanes;
+}
+
+const VideoLanes& VideoLanes::fastest()
+{
+    const VideoLanes* wide = avx2_video_lanes();
+    return wide ? *wide : plain_lanes;
+}
+
+const VideoLanes& VideoLanes::current()
+{
+    if (!in_use)
+        in_use = &fastest();
+    return *in_use;
+}
+
+void VideoLanes::install(const VideoLanes* other)
+{
+    in_use = other;
+}
+
+} // namespace zt_platform
