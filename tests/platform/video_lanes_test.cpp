@@ -1,0 +1,207 @@
+#include "platform/video_lanes.h"
+
+#include <random>
+#include <vector>
+
+#include <gtest/gtest.h>
+
+namespace {
+
+using zt_platform::ChannelWeights;
+using zt_platform::VideoCarry;
+using zt_platform::VideoLanes;
+using zt_platform::VideoMix;
+using Words = std::vector<std::uint32_t>;
+using Bytes = std::vector<unsigned char>;
+
+/// Each test runs with the plain lanes and with the fastest.
+class VideoLanesTest : public testing::TestWithParam<const VideoLanes*>
+{
+protected:
+    const VideoLanes& lanes = *GetParam();
+    std::mt19937 random{52};
+
+    std::uint32_t Word() { return static_cast<std::uint32_t>(random()); }
+
+    int Between(int least, int most)
+    {
+        return least + static_cast<int>(
+                           Word() % static_cast<unsigned>(most - least + 1));
+    }
+
+    ChannelWeights AnyWeights()
+    {
+        return {Between(-32768, 32767), Between(-65536, 65534),
+                Between(-32768, 32767)};
+    }
+
+    VideoMix AnyMix()
+    {
+        return {AnyWeights(),
+                Between(0, 255),
+                {{AnyWeights(), AnyWeights(), Between(0, 255)},
+                 {AnyWeights(), AnyWeights(), Between(0, 255)}}};
+    }
+
+    Words AnyPixels(std::size_t count)
+    {
+        Words pixels(count);
+        for (std::uint32_t& pixel : pixels)
+            pixel = Word();
+        return pixels;
+    }
+
+    Bytes Mixed(const Words& pixels, const VideoMix& video, VideoCarry& carry)
+    {
+        Bytes groups(2 * pixels.size() + 1, 0xA5);
+        lanes.mix(pixels.data(), groups.data(), pixels.size() / 2, video,
+                  carry);
+        EXPECT_EQ(groups.back(), 0xA5);
+        groups.pop_back();
+        return groups;
+    }
+};
+
+INSTANTIATE_TEST_SUITE_P(Plain, VideoLanesTest,
+                         testing::Values(&VideoLanes::plain()));
+INSTANTIATE_TEST_SUITE_P(Fastest, VideoLanesTest,
+                         testing::Values(&VideoLanes::fastest()));
+
+constexpr VideoMix nothing = {
+    {0, 0, 0}, 0, {{{0, 0, 0}, {0, 0, 0}, 0}, {{0, 0, 0}, {0, 0, 0}, 0}}};
+
+TEST_P(VideoLanesTest, LumasAreOfOnePixelEach)
+{
+    VideoMix video = nothing;
+    video.luma = {16384, 0, 0};
+    video.luma_offset = 16;
+    VideoCarry carry;
+
+    Bytes groups = Mixed({0x80000000, 0x40000000, 0xFC000000, 0}, video, carry);
+
+    EXPECT_EQ(groups, (Bytes{0, 16 + 32, 0, 16 + 16, 0, 16 + 63, 0, 16}));
+}
+
+TEST_P(VideoLanesTest, BytesAreTakenModulo256)
+{
+    VideoMix video = nothing;
+    video.luma = {0, 65534, 0};
+    video.luma_offset = 16;
+    VideoCarry carry;
+
+    // 255 * 65534 is 254 wholes and 65026 parts, and 255 wholes with a carry.
+    Bytes groups = Mixed({0x00FF0000, 0x00FF0000}, video, carry);
+
+    EXPECT_EQ(groups, (Bytes{0, 254 + 16 - 256, 0, 255 + 16 - 256}));
+}
+
+TEST_P(VideoLanesTest, AChromaIsOfTheFirstPixelAndTheSecondOnesOnBothSides)
+{
+    VideoMix video = nothing;
+    video.chroma[0] = {{16384, 0, 0}, {8192, 0, 0}, 128};
+    video.chroma[1] = {{0, 0, -16384}, {0, 0, -8192}, 128};
+    VideoCarry carry;
+
+    Bytes groups =
+        Mixed({0x40004000, 0x80008000, 0x10001000, 0x20002000}, video, carry);
+
+    EXPECT_EQ(groups, (Bytes{128 + 16 + 16, 0, 128 - 32, 0, //
+                             128 + 16 + 4 + 4, 0, 128 - 24, 0}));
+    EXPECT_EQ(carry.second[0], 0x20 * 8192);
+    EXPECT_EQ(carry.second[1], 0x20 * -8192);
+}
+
+TEST_P(VideoLanesTest, AlphaIsIgnored)
+{
+    VideoMix video = AnyMix();
+    Words pixels = AnyPixels(64);
+    Words opaque = pixels;
+    for (std::uint32_t& pixel : opaque)
+        pixel |= 0xFF;
+    VideoCarry carry;
+    VideoCarry carry_of_opaque;
+
+    EXPECT_EQ(Mixed(pixels, video, carry),
+              Mixed(opaque, video, carry_of_opaque));
+}
+
+TEST_P(VideoLanesTest, AFractionIsCarriedUntilItMakesAWhole)
+{
+    VideoMix video = nothing;
+    video.luma = {1, 0, 0};
+    VideoCarry carry;
+
+    // 257 times 255 is 65535, one short.
+    Bytes groups = Mixed(Words(512, 0xFF000000), video, carry);
+
+    for (std::size_t i = 0; i < 512; ++i)
+        EXPECT_EQ(groups[2 * i + 1], i == 257 ? 1 : 0) << i;
+    EXPECT_EQ(carry.luma, 512u * 255 - 65536);
+}
+
+TEST_P(VideoLanesTest, APartGoesOnWhereTheOneBeforeEnded)
+{
+    VideoMix video = AnyMix();
+    Words pixels = AnyPixels(2 * 200);
+    VideoCarry carry;
+    Bytes whole = Mixed(pixels, video, carry);
+    for (std::size_t cut = 0; cut <= 400; cut += 2) {
+        VideoCarry carry_of_parts;
+        auto middle = pixels.begin() + static_cast<std::ptrdiff_t>(cut);
+
+        Bytes parts =
+            Mixed(Words(pixels.begin(), middle), video, carry_of_parts);
+        Bytes rest = Mixed(Words(middle, pixels.end()), video, carry_of_parts);
+
+        parts.insert(parts.end(), rest.begin(), rest.end());
+        ASSERT_EQ(parts, whole) << cut;
+        ASSERT_EQ(carry_of_parts.luma, carry.luma);
+    }
+}
+
+// The plain ones are compared with a reference in the tests of the frame.
+TEST_P(VideoLanesTest, AllGiveTheSameBitsAsThePlainOnes)
+{
+    for (int i = 0; i < 2000; ++i) {
+        VideoMix video = AnyMix();
+        Words pixels = AnyPixels(2 * (Word() % 40));
+        VideoCarry carry;
+        carry.luma = Word() & 0xFFFF;
+        carry.chroma[0] = Word() & 0xFFFF;
+        carry.chroma[1] = Word() & 0xFFFF;
+        carry.second[0] = Between(-1000000, 1000000);
+        carry.second[1] = Between(-1000000, 1000000);
+        VideoCarry plain_carry = carry;
+        Bytes expected(2 * pixels.size());
+        VideoLanes::plain().mix(pixels.data(), expected.data(),
+                                pixels.size() / 2, video, plain_carry);
+
+        ASSERT_EQ(Mixed(pixels, video, carry), expected) << i;
+
+        ASSERT_EQ(carry.luma, plain_carry.luma);
+        for (int kind = 0; kind < 2; ++kind) {
+            ASSERT_EQ(carry.chroma[kind], plain_carry.chroma[kind]);
+            ASSERT_EQ(carry.second[kind], plain_carry.second[kind]);
+        }
+    }
+}
+
+TEST(VideoLanes, TheFastestAreInUseUnlessOthersAreInstalled)
+{
+    EXPECT_EQ(&VideoLanes::current(), &VideoLanes::fastest());
+
+    VideoLanes::install(&VideoLanes::plain());
+    EXPECT_EQ(&VideoLanes::current(), &VideoLanes::plain());
+
+    VideoLanes::install(nullptr);
+    EXPECT_EQ(&VideoLanes::current(), &VideoLanes::fastest());
+}
+
+TEST(VideoLanes, TheyAreToldApartByTheirNames)
+{
+    EXPECT_STREQ(VideoLanes::plain().name(), "plain");
+    bool same = &VideoLanes::plain() == &VideoLanes::fastest();
+    EXPECT_STREQ(VideoLanes::fastest().name(), same ? "plain" : "avx2");
+}
+
+} // namespace
