@@ -371,9 +371,11 @@ TEST_F(FrameStore, NothingIsAllocated)
 
 TEST_F(FrameStore, AStandardErrorThatThrowsChangesNothing)
 {
-    ThrowingStderr throwing;
-
-    Send();
+    ZtImageSGI image(648, 486, NewPixels(pixels));
+    {
+        ThrowingStderr throwing;
+        image.ToDDR(7);
+    }
 
     EXPECT_EQ(sockets.sent.size(), 699908u);
     EXPECT_EQ(sockets.closed, 1);
