@@ -1,6 +1,7 @@
 #include "edge/search.h"
 
 #include <algorithm>
+#include <array>
 #include <cmath>
 #include <map>
 #include <utility>
@@ -20,6 +21,10 @@ constexpr int least_coarse_height = 15; ///< Values a coarse pattern keeps.
 constexpr std::size_t kept_a_size = 8;  ///< Places followed for each size.
 constexpr std::size_t kept_in_all = 16; ///< After the first refinement.
 constexpr int most_moves = 16;          ///< Of a place on one level.
+
+// A coarse score below this part of the threshold will not rise above it. Fine
+// grain is nearly lost on the coarse levels, so the part is small.
+constexpr double hopeless = 0.25;
 
 constexpr double same_while_refined = 0.5; ///< Overlap of one and the same.
 constexpr double same_in_the_end = 0.3;
@@ -140,6 +145,7 @@ private:
     const Grey& thumbnail;
     double threshold;
     std::map<std::pair<int, int>, Pattern> patterns; ///< By size and level.
+    std::map<std::array<int, 4>, double> scores; ///< Of places tried so far.
 };
 
 /// Gives a length of the thumbnail at some size, in pixels of the frame.
@@ -195,10 +201,17 @@ bool Searcher::lies_inside(const Place& place)
            place.y + wanted.height <= picture.height;
 }
 
+/// Gives the score of a place. Walks of several places meet, so that what was
+/// worked out is kept.
 double Searcher::score_at(const Place& place)
 {
-    return Score(frame.At(place.level), pattern(place.size, place.level),
-                 place.x, place.y);
+    const auto [known, is_new] =
+        scores.try_emplace({place.level, place.size, place.y, place.x}, 0.0);
+    if (is_new)
+        known->second =
+            Score(frame.At(place.level), pattern(place.size, place.level),
+                  place.x, place.y);
+    return known->second;
 }
 
 /// Gives the best places of a size on its coarse level: peaks that are not
@@ -208,14 +221,14 @@ double Searcher::score_at(const Place& place)
 std::vector<Place> Searcher::coarse_places(int size)
 {
     const int level = coarse_level(size);
-    const ScoreMap scores(frame.At(level), pattern(size, level));
+    const ScoreMap map(frame.At(level), pattern(size, level));
     std::vector<Place> places;
-    for (int y = 0; y < scores.rows; ++y)
-        for (int x = 0; x < scores.columns; ++x) {
+    for (int y = 0; y < map.rows; ++y)
+        for (int x = 0; x < map.columns; ++x) {
             Place place{.x = x, .y = y, .size = size, .level = level};
-            place.score = scores.At(x, y);
-            if (place.score > 0.0 && place.score >= threshold / 2 &&
-                scores.IsPeak(x, y))
+            place.score = map.At(x, y);
+            if (place.score > 0.0 && place.score >= hopeless * threshold &&
+                map.IsPeak(x, y))
                 places.push_back(place);
         }
     keep_best(places, kept_a_size);

@@ -10,29 +10,19 @@
 #include "ZT/filepath.h"
 #include "ZT/image_sgi.h"
 
+#include "core/joined_text.h"
 #include "core/write_text.h"
 
 namespace {
 constexpr int not_configured = -1;
 constexpr int type_by_name = 3;
 
-using Text = std::unique_ptr<char[]>;
-
-// The picture's path, of any length; null when there is no memory.
-Text path_of(const char* dir, const char* file)
+// The picture's path; null when there is no memory.
+std::unique_ptr<char[]> path_of(const char* dir, const char* file)
 {
-    const bool alone = !dir || *file == '/';
-    const std::size_t head = alone ? 0 : std::strlen(dir) + 1;
-    const std::size_t tail = std::strlen(file) + 1;
-    Text path(new (std::nothrow) char[head + tail]);
-    if (!path)
-        return path;
-    if (!alone) {
-        std::memcpy(path.get(), dir, head - 1);
-        path[head - 1] = '/';
-    }
-    std::memcpy(path.get() + head, file, tail);
-    return path;
+    if (!dir || *file == '/')
+        return zt_core::joined_text({file});
+    return zt_core::joined_text({dir, "/", file});
 }
 
 // The thumbnail of the picture at `path`; null if it has no pixels.
@@ -114,7 +104,7 @@ void KvoRecognizerTarget::LoadPicture(const char* dir, const char* file)
     if (!file)
         return;
     // `file` may be the present name itself, so that one goes last.
-    const Text path = path_of(dir, file);
+    const auto path = path_of(dir, file);
     char* former_name = picture_name;
     picture_name = strdup(file);
     std::free(former_name);
