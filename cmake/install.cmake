@@ -117,3 +117,9 @@ install(DIRECTORY examples DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT doc
   PATTERN CMakeLists.txt EXCLUDE)
 install(DIRECTORY ${PROJECT_SOURCE_DIR}/build/docs/html
   DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT doc OPTIONAL)
+
+# Only scripts/make-packages asks for packages.
+option(ZT_BUILD_PACKAGES "Let cpack make Debian packages" OFF)
+if(ZT_BUILD_PACKAGES)
+  include(cmake/package.cmake)
+endif()

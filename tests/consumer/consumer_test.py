@@ -1,9 +1,10 @@
 """Builds and runs a host program against the library, one way a test.
 
-Usage: consumer_test.py WAY TREE BUILD COMPILER LIBDIR
+Usage: consumer_test.py WAY TREE BUILD COMPILER LIBDIR [--installed]
 
 WAY is `install`, which installs the library and moves the folder; then
-`find_package` and `pkg_config`, which need that; or `add_subdirectory`.
+`find_package` and `pkg_config`, which need that; or `add_subdirectory`. With
+`--installed` the library is where everybody finds it.
 """
 
 import os
@@ -18,13 +19,16 @@ STANDARDS = ("17", "20")
 
 
 class Consumer:
-    def __init__(self, tree, build, compiler, libdir):
+    def __init__(self, tree, build, compiler, libdir, installed=None):
         self.tree = pathlib.Path(tree)
         self.build = pathlib.Path(build)
         self.compiler = compiler
         self.folder = self.build / "consumer"
         self.first = self.folder / "first place"
         self.prefix = self.folder / "moved here"
+        self.installed = installed is not None
+        if self.installed:
+            self.prefix = pathlib.Path("/usr")
         self.libdir = self.prefix / libdir
         self.source = self.tree / "tests/consumer"
 
@@ -69,8 +73,9 @@ class Consumer:
         return made
 
     def find_package(self):
-        made = self.configured("by_find_package",
-                               f"-DCMAKE_PREFIX_PATH={self.prefix}")
+        place = ([] if self.installed else
+                 [f"-DCMAKE_PREFIX_PATH={self.prefix}"])
+        made = self.configured("by_find_package", *place)
         for standard in STANDARDS:
             self.expect(made / f"consumer{standard}", standard)
         self.expect(made / "consumer_static", "17")
@@ -80,9 +85,10 @@ class Consumer:
             sys.exit("the host is not told how to compute")
 
     def pkg_config(self):
-        path = str(self.libdir / "pkgconfig")
+        place = ({} if self.installed else
+                 {"PKG_CONFIG_PATH": str(self.libdir / "pkgconfig")})
         flags = self.run("pkg-config", "--cflags", "--libs", "zt_util2",
-                         PKG_CONFIG_PATH=path)
+                         **place)
         folder = self.folder / "by_pkg_config"
         folder.mkdir(exist_ok=True)
         for standard in STANDARDS:
@@ -91,7 +97,8 @@ class Consumer:
             self.run("sh", "-ec", f"'{self.compiler}' -std=c++{standard} "
                      f"-Wall -Wextra -Werror '{self.source}/consumer.cpp' "
                      f"{flags.strip()} -o '{program}'")
-            self.expect(program, standard, str(self.libdir))
+            self.expect(program, standard,
+                        "" if self.installed else str(self.libdir))
 
     def add_subdirectory(self):
         # The flags of the build that the test belongs to, so that the
