@@ -456,9 +456,15 @@ public:
     constexpr KvoMat& InitOrtho2(float left, float right, float bottom,
                                  float top);
 
-    /// Makes the view of an eye that looks at the origin from a distance.
+    /// Makes a view of the origin from a distance: turns by twist, incidence
+    /// and azimuth, with a translation by -dist along z before all of them.
     ///
-    /// Units: azimuth, incidence and twist in degrees.
+    /// Units:     azimuth, incidence and twist in degrees.
+    /// By design: the translation acts first, so that the scene swings round
+    ///            the eye (KvoMat.InitPolarviewSwingsRoundTheOrigin); for an
+    ///            eye that goes round the scene combine `InitZrot(-azim)`,
+    ///            `Xrot(-inc, 1)`, `Zrot(-twist, 1)` and `Trans(0, 0, -dist,
+    ///            1)`.
     KvoMat& InitPolarview(float dist, float azim, float inc, float twist);
 
     /// Makes the view of an eye that looks from one point towards another.

@@ -4,6 +4,7 @@
 /// \file
 /// The shell as a whole: a runner with all the words.
 
+#include "geometry/geometry.h"
 #include "options.h"
 #include "pictures/picture_table.h"
 #include "script/runner.h"
@@ -11,12 +12,14 @@
 #include "words/beat_words.h"
 #include "words/clock_words.h"
 #include "words/common_words.h"
+#include "words/geometry_words.h"
 #include "words/language_words.h"
 #include "words/picture_words.h"
 #include "words/sequence_words.h"
 #include "words/shuttle_words.h"
 #include "words/time_words.h"
 #include "words/wait_words.h"
+#include "words/wire_words.h"
 
 namespace ztsh {
 
@@ -37,6 +40,7 @@ private:
 
     Runner runner;
     PictureTable pictures;
+    Geometry geometry;
     ClockTable clocks;
     CommonWords common;
     LanguageWords language;
@@ -47,6 +51,8 @@ private:
     ClockWords clock_words;
     WaitWords wait;
     ShuttleWords shuttles;
+    GeometryWords geometry_words;
+    WireWords wire_words;
 };
 
 } // namespace ztsh

@@ -5,6 +5,7 @@
 #include "pictures/png_file.h"
 #include "pictures/terminal_picture.h"
 #include "system/terminal.h"
+#include "words/picture_size.h"
 
 #include <ZT/error.h>
 
@@ -29,8 +30,6 @@ enum Selector : int {
 };
 
 constexpr int output_descriptor = 1;
-constexpr long most_side = 65535;
-constexpr long most_pixels = 1L << 28;
 
 const std::vector<Word> words = {
     {"Load", "NAME FILE [sgi|yuv|pix|auto]",
@@ -165,24 +164,15 @@ void PictureWords::resize(KvoStatement& statement, int selector)
 {
     const char* word = words[static_cast<std::size_t>(selector)].name;
     const char* name = statement.ArgText(1);
-    long width = 0;
-    long height = 0;
-    if (!ReadNumber(statement.ArgText(2), 1, most_side, width) ||
-        !ReadNumber(statement.ArgText(3), 1, most_side, height) ||
-        width * height > most_pixels) {
-        ZtError("%s: expected a width and a height of 1 to %ld pixels, "
-                "together at most %ld, not %s and %s\n",
-                word, most_side, most_pixels, statement.ArgText(2),
-                statement.ArgText(3));
-        return;
-    }
-    if (!find(word, name))
+    PictureSize size = {};
+    if (!TakePictureSize(word, statement.ArgText(2), statement.ArgText(3),
+                         size) ||
+        !find(word, name))
         return;
     Picture* picture = pictures.FindToChange(name);
-    if (!picture || !scale(picture->image, selector, static_cast<int>(width),
-                           static_cast<int>(height)))
-        ZtError("%s: not enough memory for %ld x %ld pixels\n", word, width,
-                height);
+    if (!picture || !scale(picture->image, selector, size.width, size.height))
+        ZtError("%s: not enough memory for %d x %d pixels\n", word, size.width,
+                size.height);
 }
 
 void PictureWords::write(KvoStatement& statement, int selector)

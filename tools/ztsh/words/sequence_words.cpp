@@ -61,9 +61,10 @@ struct SequenceWords::Tally
     ProgressBar bar;
 };
 
-SequenceWords::SequenceWords(Runner& script_runner, PictureTable& picture_table)
+SequenceWords::SequenceWords(Runner& script_runner, PictureTable& picture_table,
+                             Geometry& named_geometry)
     : WordDirector(script_runner.dispatcher, words), runner(script_runner),
-      pictures(picture_table)
+      pictures(picture_table), geometry(named_geometry)
 {}
 
 void SequenceWords::Do(KvoStatement& statement, int selector)
@@ -165,6 +166,7 @@ int SequenceWords::run_frame(const std::string& frame, const Block& block)
     DirectoryKeeper directory;
     Variables variables = runner.variables;
     PictureTable former_pictures = pictures;
+    Geometry former_geometry = geometry;
     Outcome outcome = runner.outcome;
     std::int32_t rate = KvoTime::default_fps;
 
@@ -179,6 +181,7 @@ int SequenceWords::run_frame(const std::string& frame, const Block& block)
     KvoTime::default_fps = rate;
     runner.outcome = outcome;
     pictures = former_pictures;
+    geometry = former_geometry;
     runner.variables = variables;
     return code;
 }

@@ -4,6 +4,7 @@
 /// \file
 /// The word for numbered sequences.
 
+#include "geometry/geometry.h"
 #include "pictures/picture_table.h"
 #include "script/runner.h"
 #include "sequence/frame_range.h"
@@ -17,14 +18,15 @@ namespace ztsh {
 /// processes if the shell has several. begin: skips a block that belongs to no
 /// such word.
 ///
-/// Every frame starts with the variables, pictures, directory and frame rate
-/// that the sequence started with, whether it runs in a worker or not; what it
-/// changes of these is gone at its end.
+/// Every frame starts with the variables, pictures, values, shapes, directory
+/// and frame rate that the sequence started with, whether it runs in a worker
+/// or not; what it changes of these is gone at its end.
 class SequenceWords : public WordDirector
 {
 public:
-    /// Requires: `script_runner` and `picture_table` outlive the director.
-    SequenceWords(Runner& script_runner, PictureTable& picture_table);
+    /// Requires: all that is given outlives the director.
+    SequenceWords(Runner& script_runner, PictureTable& picture_table,
+                  Geometry& named_geometry);
 
 protected:
     void Do(KvoStatement& statement, int selector) override;
@@ -46,6 +48,7 @@ private:
 
     Runner& runner;
     PictureTable& pictures;
+    Geometry& geometry;
 };
 
 } // namespace ztsh
