@@ -1,7 +1,7 @@
 // The tour runs as a program; what it leaves behind is read with libpng and
 // held against the pictures it began with.
 
-#include "png_reading.h"
+#include "common/png_reading.h"
 #include "support/TempDir.h"
 
 #include <ZT/image_sgi.h>

@@ -1,7 +1,7 @@
 // The turn-table runs as a program, in the shell itself and in workers; the
 // pictures that it leaves behind are read with libpng.
 
-#include "png_reading.h"
+#include "common/png_reading.h"
 #include "support/TempDir.h"
 
 #include <algorithm>

@@ -1,13 +1,13 @@
 #include "pictures/best_scale.h"
 
-#include "pictures/opaque.h"
+#include "common/opaque.h"
 
 namespace ztsh {
 
 bool ScaleBest(ZtImageSGI& image, int width, int height)
 {
     constexpr int red_shift = 24;
-    ZtPixel alpha = IsOpaque(image) ? opaque_alpha : 0;
+    ZtPixel alpha = zt_tools::IsOpaque(image) ? zt_tools::opaque_alpha : 0;
     ZtImageSGI reds(image);
     if (!reds.pixels)
         return false;

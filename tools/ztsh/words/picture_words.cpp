@@ -1,8 +1,8 @@
 #include "words/picture_words.h"
 
+#include "common/png_file.h"
 #include "pictures/best_scale.h"
 #include "pictures/picture_files.h"
-#include "pictures/png_file.h"
 #include "pictures/terminal_picture.h"
 #include "system/terminal.h"
 #include "words/picture_size.h"
@@ -182,8 +182,9 @@ void PictureWords::write(KvoStatement& statement, int selector)
     if (!picture)
         return;
     const char* file = statement.ArgText(2);
-    std::string why = selector == Store ? StorePicture(picture->image, file)
-                                        : WritePng(picture->image, file);
+    std::string why = selector == Store
+                          ? StorePicture(picture->image, file)
+                          : zt_tools::WritePng(picture->image, file);
     if (why.empty())
         return;
     ZtError("%s: cannot write %s: %s\n", word, file, why.c_str());

@@ -1,5 +1,5 @@
-#ifndef ZTSH_PICTURES_OPAQUE_H
-#define ZTSH_PICTURES_OPAQUE_H
+#ifndef ZT_TOOLS_COMMON_OPAQUE_H
+#define ZT_TOOLS_COMMON_OPAQUE_H
 
 /// \file
 /// Whether light comes through a picture.
@@ -8,7 +8,7 @@
 
 #include <algorithm>
 
-namespace ztsh {
+namespace zt_tools {
 
 /// The alpha of an opaque pixel, at its place in the pixel.
 constexpr ZtPixel opaque_alpha = 0xFF;
@@ -23,6 +23,6 @@ inline bool IsOpaque(const ZtImageSGI& image)
     });
 }
 
-} // namespace ztsh
+} // namespace zt_tools
 
 #endif

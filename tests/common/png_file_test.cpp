@@ -1,6 +1,4 @@
-#include "pictures/png_file.h"
-#include "png_reading.h"
-#include "support/TempDir.h"
+#include "common/png_file.h"
 
 #include <algorithm>
 #include <csignal>
@@ -10,7 +8,10 @@
 
 #include <gtest/gtest.h>
 
-using ztsh::WritePng;
+#include "common/png_reading.h"
+#include "support/TempDir.h"
+
+using zt_tools::WritePng;
 
 namespace {
 

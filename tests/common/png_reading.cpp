@@ -1,4 +1,4 @@
-#include "png_reading.h"
+#include "common/png_reading.h"
 
 #include <gtest/gtest.h>
 #include <png.h>

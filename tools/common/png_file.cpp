@@ -1,7 +1,7 @@
-#include "pictures/png_file.h"
+#include "common/png_file.h"
 
-#include "pictures/opaque.h"
-#include "system/files.h"
+#include "common/files.h"
+#include "common/opaque.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -10,7 +10,7 @@
 
 #include <png.h>
 
-namespace ztsh {
+namespace zt_tools {
 
 namespace {
 
@@ -68,4 +68,4 @@ std::string WritePng(const ZtImageSGI& image, const std::string& name)
     return why.empty() ? making.PutInPlace() : why;
 }
 
-} // namespace ztsh
+} // namespace zt_tools

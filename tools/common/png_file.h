@@ -1,5 +1,5 @@
-#ifndef ZTSH_PICTURES_PNG_FILE_H
-#define ZTSH_PICTURES_PNG_FILE_H
+#ifndef ZT_TOOLS_COMMON_PNG_FILE_H
+#define ZT_TOOLS_COMMON_PNG_FILE_H
 
 /// \file
 /// Pictures as PNG files, for other programs to look at.
@@ -8,7 +8,7 @@
 
 #include <string>
 
-namespace ztsh {
+namespace zt_tools {
 
 /// Writes `image` as a PNG file of 8 bits a channel: with alpha if any pixel
 /// is not opaque, else without. An older file is replaced only when the new
@@ -17,6 +17,6 @@ namespace ztsh {
 /// Returns: the empty text, or why there is no such file now.
 std::string WritePng(const ZtImageSGI& image, const std::string& name);
 
-} // namespace ztsh
+} // namespace zt_tools
 
 #endif
