@@ -8,6 +8,8 @@ before the first section says what the case shows.
 
   --- args        the command line, split as a POSIX shell does; default: none
   --- file NAME   a file in the directory that the shell runs in
+  --- program NAME  a file that may be executed
+  --- environment  variables of the environment, NAME=VALUE, one a line
   --- bytes NAME  a file, its bytes in hexadecimal; "00*500" is 500 of them
   --- input       standard input; default: empty
   --- output      what standard output must be; default: empty
@@ -63,16 +65,19 @@ def bytes_of(text):
 
 def run(shell, tree, case, directory):
     texts = {"args": "", "input": "", "output": "", "errors": "", "exit": "0",
-             "made": ""}
+             "made": "", "environment": ""}
     places = {"{dir}": str(directory), "{tree}": tree, "{shell}": shell}
     for name, text in sections_of(case):
         for mark, place in places.items():
             text = text.replace(mark, place)
-        if name.startswith("file "):
-            path = directory / name[5:]
+        kind, _, rest = name.partition(" ")
+        if kind in ("file", "program"):
+            path = directory / rest
             path.parent.mkdir(parents=True, exist_ok=True)
             path.write_text(text.replace("<no newline>\n", ""),
                             encoding="utf-8")
+            if kind == "program":
+                path.chmod(0o755)
         elif name.startswith("bytes "):
             (directory / name[6:]).write_bytes(bytes_of(text))
         elif name in texts:
@@ -80,7 +85,12 @@ def run(shell, tree, case, directory):
         else:
             raise SystemExit(f"{case}: no section is called {name}")
 
-    environment = dict(os.environ, LC_ALL="C.UTF-8", HOME=str(directory))
+    # The installation of whoever runs the tests is none of the cases'.
+    environment = {name: value for name, value in os.environ.items()
+                   if not name.startswith(("QUARN_", "ZT_"))}
+    environment.update(LC_ALL="C.UTF-8", HOME=str(directory))
+    environment.update(line.split("=", 1)
+                       for line in texts["environment"].splitlines())
     done = subprocess.run([shell] + shlex.split(texts["args"]), cwd=directory,
                           input=texts["input"].replace("<no newline>\n", ""),
                           text=True, capture_output=True, timeout=SECONDS,

@@ -127,18 +127,18 @@ TEST(Runner, HereIsTheDirectoryOfTheScriptWhileItRuns)
         }
         void Act(KvoStatement*, int) override
         {
-            here = *runner.variables.Find("here");
+            here = runner.variables.Find("here");
         }
         Runner& runner;
         std::string here;
     } recorder(runner);
-    std::string before = *runner.variables.Find("here");
+    std::string before = runner.variables.Find("here");
 
     runner.RunFile(name);
 
     EXPECT_EQ(recorder.here,
               std::filesystem::canonical(dir.Path("sub")).string());
-    EXPECT_EQ(*runner.variables.Find("here"), before);
+    EXPECT_EQ(std::string(runner.variables.Find("here")), before);
 }
 
 TEST(ReportHandler, CountsWarningsAndErrorsOnly)

@@ -1,5 +1,8 @@
 #include "words/variables.h"
 
+#include <set>
+#include <string>
+
 #include <gtest/gtest.h>
 
 using ztsh::Variables;
@@ -66,6 +69,75 @@ TEST(Variables, RemoveForgets)
     variables.Remove("a");
 
     EXPECT_EQ(variables.Find("a"), nullptr);
+}
+
+TEST(Variables, SetAgainReplaces)
+{
+    Variables variables;
+    variables.Set("a", "x");
+
+    variables.Set("a", "longer than before");
+
+    EXPECT_STREQ(variables.Find("a"), "longer than before");
+    EXPECT_EQ(variables.Names(), std::set<std::string>{"a"});
+}
+
+TEST(Variables, WhatWasForgottenMayBeSetAgain)
+{
+    Variables variables;
+    variables.Set("a", "x");
+    variables.Remove("a");
+    variables.Remove("a");
+
+    EXPECT_TRUE(variables.Names().empty());
+    variables.Set("a", "");
+    EXPECT_STREQ(variables.Find("a"), "");
+}
+
+TEST(Variables, AreListedInTheOrderOfTheirNames)
+{
+    Variables variables;
+    for (const char* name : {"b", "a_", "a", "B"})
+        variables.Set(name, "x");
+
+    std::string all;
+    for (const std::string& name : variables.Names())
+        all += name + " ";
+    EXPECT_EQ(all, "B a a_ b ");
+}
+
+TEST(Variables, ACopyIsAStoreOfItsOwn)
+{
+    Variables variables;
+    variables.Set("kept", "1");
+    variables.Set("changed", "1");
+    variables.Set("removed", "1");
+
+    Variables copy = variables;
+    copy.Set("changed", "2");
+    copy.Set("added", "2");
+    copy.Remove("removed");
+
+    EXPECT_STREQ(variables.Find("changed"), "1");
+    EXPECT_STREQ(variables.Find("removed"), "1");
+    EXPECT_EQ(variables.Find("added"), nullptr);
+    EXPECT_STREQ(copy.Find("kept"), "1");
+    EXPECT_STREQ(copy.Find("changed"), "2");
+}
+
+TEST(Variables, AssignmentLeavesNothingOfBefore)
+{
+    Variables variables, others;
+    variables.Set("before", "1");
+    variables.Set("both", "1");
+    others.Set("both", "2");
+
+    variables = others;
+    variables = *&variables;
+
+    EXPECT_EQ(variables.Names(), std::set<std::string>{"both"});
+    EXPECT_STREQ(variables.Find("both"), "2");
+    EXPECT_EQ(variables.Find("before"), nullptr);
 }
 
 TEST(Variables, NamesAreLettersDigitsAndUnderscores)

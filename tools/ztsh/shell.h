@@ -15,6 +15,7 @@
 #include "words/geometry_words.h"
 #include "words/language_words.h"
 #include "words/picture_words.h"
+#include "words/preference_words.h"
 #include "words/sequence_words.h"
 #include "words/shuttle_words.h"
 #include "words/time_words.h"
@@ -45,6 +46,7 @@ private:
     CommonWords common;
     LanguageWords language;
     PictureWords picture_words;
+    PreferenceWords preferences;
     SequenceWords sequences;
     TimeWords times;
     BeatWords beat;

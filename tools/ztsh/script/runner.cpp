@@ -65,8 +65,8 @@ public:
     HereScope(Runner& own_runner, const std::string& directory)
         : runner(own_runner)
     {
-        if (const std::string* present = runner.variables.Find(here_variable))
-            former = *present;
+        if (const char* present = runner.variables.Find(here_variable))
+            former = present;
         runner.variables.Set(here_variable, runner.shown_directory(directory));
     }
     ~HereScope()

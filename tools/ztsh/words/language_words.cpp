@@ -138,8 +138,9 @@ void LanguageWords::set(const char* name, const char* value)
 
 void LanguageWords::list_variables()
 {
-    for (const auto& [name, value] : runner.variables.All())
-        std::cout << "    " << name << " " << value << "\n";
+    for (const std::string& name : runner.variables.Names())
+        std::cout << "    " << name << " " << runner.variables.Find(name)
+                  << "\n";
 }
 
 void LanguageWords::make_directory(const char* name)

@@ -31,20 +31,38 @@ bool Variables::IsName(const std::string& name)
     return !name.empty() && name_length(name, 0) == name.size();
 }
 
-const std::string* Variables::Find(const std::string& name) const
+Variables::Variables(const Variables& other)
 {
-    auto found = values.find(name);
-    return found == values.end() ? nullptr : &found->second;
+    *this = other;
+}
+
+Variables& Variables::operator=(const Variables& other)
+{
+    if (this == &other)
+        return *this;
+    while (!names.empty())
+        Remove(*names.begin());
+    for (const std::string& name : other.names)
+        Set(name, other.Find(name));
+    return *this;
+}
+
+const char* Variables::Find(const std::string& name) const
+{
+    return names.count(name) != 0 ? values.GetText(name.c_str()) : nullptr;
 }
 
 void Variables::Set(const std::string& name, const std::string& value)
 {
-    values[name] = value;
+    names.insert(name);
+    values.Set(name.c_str(), value.c_str());
 }
 
 void Variables::Remove(const std::string& name)
 {
-    values.erase(name);
+    // The name may be the one that is about to be forgotten.
+    values.Set(name.c_str(), "");
+    names.erase(name);
 }
 
 std::string Variables::Expand(const std::string& text,
@@ -67,8 +85,8 @@ std::string Variables::Expand(const std::string& text,
         }
         at = end + (braces ? 1 : 0);
         std::string name = text.substr(start, length);
-        if (const std::string* value = Find(name)) {
-            expanded += *value;
+        if (const char* value = Find(name)) {
+            expanded += value;
         } else {
             unknown.push_back(name);
             expanded.append(text, dollar, at - dollar);

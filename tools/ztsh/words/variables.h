@@ -4,16 +4,23 @@
 /// \file
 /// The values that a script names with `$name` and `${name}`.
 
-#include <map>
+#include <ZT/property.h>
+
+#include <set>
 #include <string>
 #include <vector>
 
 namespace ztsh {
 
-/// Named texts.
+/// Named texts. What is copied is a store of its own.
 class Variables
 {
 public:
+    Variables() = default;
+    Variables(const Variables& other);
+    Variables& operator=(const Variables& other);
+    ~Variables() = default;
+
     /// Tells whether `name` is a letter or underscore followed by letters,
     /// digits and underscores.
     static bool IsName(const std::string& name);
@@ -21,7 +28,7 @@ public:
     /// Gives the value of `name`, null if there is none.
     ///
     /// Owner: this object, until the variable is set again.
-    const std::string* Find(const std::string& name) const;
+    const char* Find(const std::string& name) const;
 
     /// Sets `name` to `value`.
     void Set(const std::string& name, const std::string& value);
@@ -35,11 +42,14 @@ public:
     std::string Expand(const std::string& text,
                        std::vector<std::string>& unknown) const;
 
-    /// Gives all variables in the order of their names.
-    const std::map<std::string, std::string>& All() const { return values; }
+    /// Gives the names of all variables, in order.
+    const std::set<std::string>& Names() const { return names; }
 
 private:
-    std::map<std::string, std::string> values;
+    /// The library's store knows no list and forgets no name, so a value in it
+    /// counts only while its name is here.
+    std::set<std::string> names;
+    ZtPropList values;
 };
 
 } // namespace ztsh
