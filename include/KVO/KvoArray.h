@@ -163,6 +163,7 @@ public:
     }
 
 protected:
+    /// Gives the elements, null if there are none.
     Element* elements() const { return static_cast<Element*>(data); }
 
 private:
@@ -178,6 +179,7 @@ private:
 class ZT_API KvoFloatArray : public KvoTypedArray<float>
 {
 public:
+    /// Makes an array of so many zeros.
     explicit KvoFloatArray(int initial_size = 0) : KvoTypedArray(initial_size)
     {}
 };
@@ -186,6 +188,7 @@ public:
 class ZT_API KvoIntArray : public KvoTypedArray<int>
 {
 public:
+    /// Makes an array of so many zeros.
     explicit KvoIntArray(int initial_size = 0) : KvoTypedArray(initial_size) {}
 };
 
@@ -193,6 +196,7 @@ public:
 class ZT_API KvoCharArray : public KvoTypedArray<char>
 {
 public:
+    /// Makes an array of so many zeros.
     explicit KvoCharArray(int initial_size = 0) : KvoTypedArray(initial_size) {}
 };
 
@@ -200,6 +204,7 @@ public:
 class ZT_API KvoByteArray : public KvoTypedArray<unsigned char>
 {
 public:
+    /// Makes an array of so many zeros.
     explicit KvoByteArray(int initial_size = 0) : KvoTypedArray(initial_size) {}
 };
 
@@ -209,6 +214,7 @@ public:
 class ZT_API KvoStringArray : public KvoTypedArray<char*>
 {
 public:
+    /// Makes an array of so many nulls.
     explicit KvoStringArray(int initial_size = 0) : KvoTypedArray(initial_size)
     {}
 };

@@ -25,6 +25,7 @@
 
 #include <type_traits>
 
+/// A sound in memory: its samples, their rate and what can be done to them.
 class ZT_API KvoSound
 {
 public:

@@ -50,6 +50,7 @@ public:
         hours = 4
     };
 
+    /// How many ticks each unit has.
     static constexpr int ticks_per_millisecond = 6;
     static constexpr int ticks_per_second = 6000;
     static constexpr int ticks_per_minute = 360000;
@@ -223,11 +224,13 @@ public:
     /// there are fewer.
     void ReadBinary(std::istream& in);
 
+    /// Adds `other`, modulo 2 to the power 32 ticks.
     constexpr KvoTime& operator+=(KvoTime other)
     {
         return *this = *this + other;
     }
 
+    /// Takes `other` away, modulo 2 to the power 32 ticks.
     constexpr KvoTime& operator-=(KvoTime other)
     {
         return *this = *this - other;

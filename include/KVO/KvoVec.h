@@ -81,6 +81,7 @@ public:
     /// Sets every component to `value`.
     constexpr KvoVec3(float value) : x(value), y(value), z(value) {}
 
+    /// Takes the components.
     constexpr KvoVec3(float x0, float y0, float z0) : x(x0), y(y0), z(z0) {}
 
     /// Takes the first three floats of an array; null gives zeros.
@@ -150,6 +151,7 @@ public:
     /// Returns: the two angles, and 0 as the third.
     KvoVec3 VecToAngles() const;
 
+    /// Gives the vector with every component negated.
     constexpr KvoVec3 operator-() const { return KvoVec3(-x, -y, -z); }
 
     /// Says whether each component differs by less than 2 to the power -23.
@@ -183,6 +185,7 @@ public:
                             : zt_geometry::illegal_component("KvoVec3", index);
     }
 
+    /// Operate component by component, in place.
     constexpr KvoVec3& operator+=(const KvoVec3& v);
     constexpr KvoVec3& operator-=(const KvoVec3& v);
     constexpr KvoVec3& operator*=(const KvoVec3& v);
@@ -194,9 +197,9 @@ public:
     ///            (KvoVec3.CompoundDivisionDoesNotLookForZeros).
     constexpr KvoVec3& operator/=(const KvoVec3& v);
 
-    float x;
-    float y;
-    float z;
+    float x; ///< The first component.
+    float y; ///< The second component.
+    float z; ///< The third component.
 };
 
 /// A vector of four components, or a point with its homogeneous divisor w.
@@ -209,6 +212,7 @@ public:
     /// Sets every component to `value`.
     constexpr KvoVec4(float value) : x(value), y(value), z(value), w(value) {}
 
+    /// Takes the components.
     constexpr KvoVec4(float x0, float y0, float z0, float w0)
         : x(x0), y(y0), z(z0), w(w0)
     {}
@@ -268,6 +272,7 @@ public:
     /// Makes the length `length`; a length of 0 stays as it is.
     KvoVec4& Scale(float length);
 
+    /// Gives the vector with every component negated.
     constexpr KvoVec4 operator-() const { return KvoVec4(-x, -y, -z, -w); }
 
     /// Says whether each component differs by less than 2 to the power -23.
@@ -303,6 +308,7 @@ public:
                             : zt_geometry::illegal_component("KvoVec4", index);
     }
 
+    /// Operate component by component, in place.
     constexpr KvoVec4& operator+=(const KvoVec4& v);
     constexpr KvoVec4& operator-=(const KvoVec4& v);
     constexpr KvoVec4& operator*=(const KvoVec4& v);
@@ -313,10 +319,10 @@ public:
     ///            (KvoVec4.CompoundDivisionDoesNotLookForZeros).
     constexpr KvoVec4& operator/=(const KvoVec4& v);
 
-    float x;
-    float y;
-    float z;
-    float w;
+    float x; ///< The first component.
+    float y; ///< The second component.
+    float z; ///< The third component.
+    float w; ///< The fourth: 1 in a point, 0 in a direction.
 };
 
 /// A 4 x 4 matrix that transforms row vectors; `m[r][c]` is column c of row r.
@@ -548,6 +554,7 @@ public:
     KvoMat Lookat(const KvoVec3& view, const KvoVec3& point, float twist,
                   KvoMatMultType type) const;
 
+    /// Gives the matrix with every element negated.
     constexpr KvoMat operator-() const;
 
     /// Gives the matrix with rows and columns exchanged.
@@ -573,6 +580,7 @@ public:
                                         : zt_geometry::illegal_row(index);
     }
 
+    /// Do what the operator without `=` does, in place.
     constexpr KvoMat& operator+=(const KvoMat& m);
     constexpr KvoMat& operator-=(const KvoMat& m);
     constexpr KvoMat& operator*=(const KvoMat& m);
@@ -643,8 +651,8 @@ public:
     /// Gives this reflected through `q`, as far on the other side.
     constexpr KvoQuat qdouble(const KvoQuat& q) const;
 
-    float s;
-    KvoVec3 v;
+    float s;   ///< The scalar part.
+    KvoVec3 v; ///< The vector part.
 };
 
 /// Operate component by component; a number stands for a vector of it.

@@ -236,12 +236,15 @@ public:
     };
 
     static float play_speed; ///< The factor of all playback.
+
+    /// Where samples stand on their way to the device and from it.
     static std::int16_t play_buffer[queue_size];
     static std::int16_t record_buffer[queue_size];
+
     static std::int32_t pv_buf[4];   ///< Pairs of a code and a value.
     static std::int32_t input_rate;  ///< As it was set last, 0 at first.
     static std::int32_t output_rate; ///< As it was set last, 0 at first.
-    static SoundRecord sound_record;
+    static SoundRecord sound_record; ///< What recording is at.
 };
 
 #endif

@@ -59,6 +59,7 @@ public:
         /// Returns: the value; 0 while it is null.
         ZT_API std::uint32_t operator*() const;
 
+        /// Tells whether it counts.
         explicit operator bool() const { return running; }
 
         friend bool operator==(const Counter& counter, std::nullptr_t)

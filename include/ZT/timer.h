@@ -38,20 +38,21 @@ using ZtTimerCallback = void (*)(ZtTimer*, void*);
 /// heap, so `new` and `delete` of one are allowed inside the beat.
 struct ZT_API ZtTimerCallbackInfo final
 {
+    /// When it is called: at a time, or again and again.
     enum Kind : int { Trigger = 0, Repeat = 1 };
 
     /// Gives room for a record, null when there is no memory.
     static void* operator new(std::size_t bytes) noexcept;
     static void operator delete(void* record) noexcept;
 
-    int kind = Trigger; ///< Of no meaning in a stop record.
-    ZtTimerCallback callback = nullptr;
+    int kind = Trigger;                 ///< Of no meaning in a stop record.
+    ZtTimerCallback callback = nullptr; ///< What is called.
     int fired = 0;               ///< Trigger: 1 once it has fired in this run.
     long interval = 0;           ///< Repeat: milliseconds of the beat's clock.
     std::int64_t last_fired = 0; ///< Repeat: the beat's milliseconds at its
                                  ///< latest call; -1 calls it at the next beat.
-    KvoTime time;         ///< Trigger: when it fires. Stop: when posted.
-    void* data = nullptr; ///< The client's, handed to the callback.
+    KvoTime time;                ///< Trigger: when it fires. Stop: when posted.
+    void* data = nullptr;        ///< The client's, handed to the callback.
     ZtTimerCallbackInfo* next = nullptr; ///< Null at the tail.
 };
 
@@ -72,7 +73,7 @@ struct ZT_API ZtTimerDeferOp
         Destroy = 9
     };
 
-    int op = ResetCallbacks;
+    int op = ResetCallbacks;             ///< A `Code`.
     ZtTimer* timer = nullptr;            ///< Null once the timer is gone.
     ZtTimerCallback callback = nullptr;  ///< Unpost: whose record goes.
     KvoTime time;                        ///< Force: the time to set.
@@ -92,12 +93,14 @@ struct ZT_API ZtTimerDeferOp
 class ZT_API ZtTimer
 {
 public:
+    /// What it is doing.
     enum State : int {
         Running = 0,
         Ended = 1, ///< Reached its end in this beat; only the beat sees it.
         Stopped = 2
     };
 
+    /// What its end is to it.
     enum EndMode : int { StopsAtEnd = 0, Endless = 3 };
 
     /// Makes an endless timer that counts up from 0 and stands still, and asks
@@ -112,8 +115,8 @@ public:
     ///
     /// Reports:   as the other constructor.
     /// By design: an end of exactly 3 or -3 ticks makes it endless
-    ///            (ZtTimerTest.AnEndOfThreeTicksEitherWayMeansEndless), and equal
-    ///            start and end make it count down
+    ///            (ZtTimerTest.AnEndOfThreeTicksEitherWayMeansEndless), and
+    ///            equal start and end make it count down
     ///            (ZtTimerTest.EqualStartAndEndCountDown).
     ZtTimer(KvoTime start_at, KvoTime end_at);
 
@@ -236,8 +239,8 @@ class ZT_API ZtTimerBeat
 public:
     ZtTimerBeat() = delete;
 
-    static constexpr int timer_limit = 6;
-    static constexpr int defer_op_limit = 100;
+    static constexpr int timer_limit = 6;      ///< Timers that it drives.
+    static constexpr int defer_op_limit = 100; ///< Requests that wait.
 
     /// Sets the clock to the time of day, installs the handler and arms the
     /// alarm for one beat. The calling thread becomes the beat's.
@@ -297,6 +300,7 @@ public:
     /// Gives what was measured since `load`.
     static const ZtTimerBeatStatistics& Statistics();
 
+    /// Queue the request of the operation of that name of the timer.
     static void tmr_reset_callbacks(ZtTimer* timer);
     static void tmr_add(ZtTimer* timer);
     /// Owner: takes the record over, which was made with `new`.
