@@ -19,6 +19,9 @@ namespace zt_platform {
 /// What `Files::accessible` asks about a path.
 enum class Access : int { Exists = 0, Read = 1, Write = 2, Execute = 3 };
 
+/// What stands at a path, links followed.
+enum class FileKind : int { Nothing = 0, Regular = 1, Other = 2 };
+
 /// The system's file calls. Handles count from 0, -1 is none.
 class Files
 {
@@ -54,6 +57,33 @@ public:
     virtual std::ptrdiff_t write_at(int handle, const void* from,
                                     std::size_t bytes,
                                     std::uint64_t offset) = 0;
+
+    /// Writes once, behind what was written before, also to what has no
+    /// offsets, like a pipe; otherwise as `write_at`.
+    virtual std::ptrdiff_t write_next(int handle, const void* from,
+                                      std::size_t bytes) = 0;
+
+    /// Tells what stands at `path`.
+    virtual FileKind kind(const char* path) = 0;
+
+    /// Gives the path without links that leads to what stands at `path`.
+    ///
+    /// Owner:   the caller, who releases it with `free`.
+    /// Returns: null when nothing stands there, or for lack of memory.
+    virtual char* resolve(const char* path) = 0;
+
+    /// Makes a file at `path`, where nothing may stand, for writing, with the
+    /// permissions of the file at `like` if there is one.
+    ///
+    /// Returns: a handle, or -1 with `errno` set.
+    virtual int open_new(const char* path, const char* like) = 0;
+
+    /// Moves the file at `from` to `to` in one step, in the place of what
+    /// stands there.
+    virtual bool move(const char* from, const char* to) = 0;
+
+    /// Removes the file at `path`.
+    virtual bool remove(const char* path) = 0;
 
     /// Closes the handle, which is gone afterwards in either case.
     ///

@@ -18,6 +18,11 @@ namespace zt_platform {
 /// Returns: null for lack of memory.
 void* new_large_block(std::size_t bytes);
 
+/// Puts what can be put there of a block on large pages.
+///
+/// Requires: that nothing was written to the block yet, or it gains little.
+void prefer_large_pages(void* block, std::size_t bytes);
+
 } // namespace zt_platform
 
 #endif

@@ -21,6 +21,9 @@ public:
     /// Starts another sequence, chosen by the seconds of the wall clock.
     virtual void seed_from_time() = 0;
 
+    /// Starts the sequence that belongs to `number`, the same each time.
+    virtual void seed(unsigned number) = 0;
+
     /// Gives the calls in use: the system's, or those that a test installed.
     static Random& current();
 

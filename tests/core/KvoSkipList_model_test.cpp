@@ -31,6 +31,7 @@ public:
     }
 
     void seed_from_time() override {}
+    void seed(unsigned) override {}
 
     int draws = 0;
     long last = 0;

@@ -114,6 +114,18 @@ public:
     {
         return -1;
     }
+    std::ptrdiff_t write_next(int, const void*, std::size_t) override
+    {
+        return -1;
+    }
+    zt_platform::FileKind kind(const char*) override
+    {
+        return zt_platform::FileKind::Nothing;
+    }
+    char* resolve(const char*) override { return nullptr; }
+    int open_new(const char*, const char*) override { return -1; }
+    bool move(const char*, const char*) override { return false; }
+    bool remove(const char*) override { return false; }
     bool close(int) override { return false; }
 
     bool answer = true;

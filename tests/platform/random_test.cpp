@@ -46,6 +46,13 @@ TEST(Random, SeedsWithTheSecondsOfTheWallClock)
     EXPECT_LE(last_seed, after);
 }
 
+TEST(Random, SeedsWithANumber)
+{
+    Random::current().seed(7);
+
+    EXPECT_EQ(last_seed, 7u);
+}
+
 TEST(Random, InstalledCallsAreUsedUntilTheyAreTakenAway)
 {
     Random* system = &Random::current();

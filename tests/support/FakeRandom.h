@@ -26,10 +26,12 @@ public:
     }
 
     void seed_from_time() override { ++seeds; }
+    void seed(unsigned number) override { last_seed = number; }
 
     std::deque<long> numbers;
     int draws = 0;
     int seeds = 0;
+    unsigned last_seed = 0xFFFFFFFF;
 
 private:
     zt_platform::Random* before;

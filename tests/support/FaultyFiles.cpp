@@ -55,23 +55,63 @@ int FaultyFiles::open_output(const char* path)
     return handle;
 }
 
-std::ptrdiff_t FaultyFiles::write_at(int handle, const void* from,
-                                     std::size_t bytes, std::uint64_t offset)
+std::size_t FaultyFiles::allowed(std::size_t bytes)
 {
     if (interrupt())
-        return -1;
-    std::uint64_t most = std::min<std::uint64_t>(most_at_once, bytes_left);
-    if (most == 0) {
-        errno = write_error;
-        return -1;
-    }
+        return 0;
+    errno = write_error;
+    return static_cast<std::size_t>(
+        std::min<std::uint64_t>({bytes, most_at_once, bytes_left}));
+}
+
+std::ptrdiff_t FaultyFiles::written(std::ptrdiff_t went)
+{
     ++writes;
-    std::ptrdiff_t went = system.write_at(
-        handle, from,
-        static_cast<std::size_t>(std::min<std::uint64_t>(bytes, most)), offset);
     if (went > 0 && bytes_left != never)
         bytes_left -= static_cast<std::uint64_t>(went);
     return went;
+}
+
+std::ptrdiff_t FaultyFiles::write_at(int handle, const void* from,
+                                     std::size_t bytes, std::uint64_t offset)
+{
+    const std::size_t most = allowed(bytes);
+    return most ? written(system.write_at(handle, from, most, offset)) : -1;
+}
+
+std::ptrdiff_t FaultyFiles::write_next(int handle, const void* from,
+                                       std::size_t bytes)
+{
+    const std::size_t most = allowed(bytes);
+    return most ? written(system.write_next(handle, from, most)) : -1;
+}
+
+zt_platform::FileKind FaultyFiles::kind(const char* path)
+{
+    return system.kind(path);
+}
+
+char* FaultyFiles::resolve(const char* path)
+{
+    return system.resolve(path);
+}
+
+int FaultyFiles::open_new(const char* path, const char* like)
+{
+    errno = EMFILE;
+    int handle = opens_fail ? -1 : system.open_new(path, like);
+    open_count += handle >= 0;
+    return handle;
+}
+
+bool FaultyFiles::move(const char* from, const char* to)
+{
+    return !moves_fail && system.move(from, to);
+}
+
+bool FaultyFiles::remove(const char* path)
+{
+    return system.remove(path);
 }
 
 bool FaultyFiles::close(int handle)

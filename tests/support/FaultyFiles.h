@@ -25,6 +25,13 @@ public:
     int open_output(const char* path) override;
     std::ptrdiff_t write_at(int handle, const void* from, std::size_t bytes,
                             std::uint64_t offset) override;
+    std::ptrdiff_t write_next(int handle, const void* from,
+                              std::size_t bytes) override;
+    zt_platform::FileKind kind(const char* path) override;
+    char* resolve(const char* path) override;
+    int open_new(const char* path, const char* like) override;
+    bool move(const char* from, const char* to) override;
+    bool remove(const char* path) override;
     bool close(int handle) override;
 
     std::size_t most_at_once = ~std::size_t{0}; ///< Bytes a call transfers.
@@ -34,6 +41,7 @@ public:
     int write_error = ENOSPC;         ///< What they fail with.
     bool close_fails = false;
     bool opens_fail = false;
+    bool moves_fail = false;
 
     int open_count = 0; ///< Files that are open now.
     int reads = 0;      ///< Calls that reached the system.
@@ -42,6 +50,13 @@ public:
 
 private:
     bool interrupt();
+
+    /// Gives how many of `bytes` the next write may take; 0 with `errno` set
+    /// when it has to fail.
+    std::size_t allowed(std::size_t bytes);
+
+    /// Counts what a write that reached the system took.
+    std::ptrdiff_t written(std::ptrdiff_t went);
 
     zt_platform::Files* before;
     zt_platform::Files& system;

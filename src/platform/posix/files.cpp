@@ -3,6 +3,8 @@
 #include <cerrno>
 #include <fcntl.h>
 #include <signal.h>
+#include <stdio.h>
+#include <stdlib.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -103,6 +105,45 @@ public:
         WriteSignalsHeld quiet;
         return ::pwrite(handle, from, bytes, static_cast<off_t>(offset));
     }
+
+    std::ptrdiff_t write_next(int handle, const void* from,
+                              std::size_t bytes) override
+    {
+        WriteSignalsHeld quiet;
+        return ::write(handle, from, bytes);
+    }
+
+    FileKind kind(const char* path) override
+    {
+        struct stat about;
+        if (!path || ::stat(path, &about) != 0)
+            return FileKind::Nothing;
+        return S_ISREG(about.st_mode) ? FileKind::Regular : FileKind::Other;
+    }
+
+    char* resolve(const char* path) override
+    {
+        return ::realpath(path, nullptr);
+    }
+
+    int open_new(const char* path, const char* like) override
+    {
+        int handle = open_now(path, O_WRONLY | O_CREAT | O_EXCL);
+        struct stat about;
+        if (handle >= 0 && ::stat(like, &about) == 0) {
+            // Best effort: a file system may know no permissions.
+            [[maybe_unused]] int changed =
+                ::fchmod(handle, about.st_mode & 07777);
+        }
+        return handle;
+    }
+
+    bool move(const char* from, const char* to) override
+    {
+        return ::rename(from, to) == 0;
+    }
+
+    bool remove(const char* path) override { return ::unlink(path) == 0; }
 
     bool close(int handle) override
     {

@@ -12,15 +12,20 @@ constexpr std::size_t large_page = std::size_t{2} << 20;
 
 } // namespace
 
-void* new_large_block(std::size_t bytes)
+void prefer_large_pages(void* block, std::size_t bytes)
 {
-    char* block = static_cast<char*>(std::malloc(bytes));
     std::uintptr_t start = reinterpret_cast<std::uintptr_t>(block);
     std::size_t before = (large_page - start % large_page) % large_page;
     // Only advice: without large pages the block is as good as any other.
     if (block && bytes >= before + large_page)
-        madvise(block + before, (bytes - before) / large_page * large_page,
-                MADV_HUGEPAGE);
+        madvise(static_cast<char*>(block) + before,
+                (bytes - before) / large_page * large_page, MADV_HUGEPAGE);
+}
+
+void* new_large_block(std::size_t bytes)
+{
+    void* block = std::malloc(bytes);
+    prefer_large_pages(block, bytes);
     return block;
 }
 

@@ -18,6 +18,8 @@ public:
     {
         ::srandom(static_cast<unsigned>(::time(nullptr)));
     }
+
+    void seed(unsigned number) override { ::srandom(number); }
 };
 
 constinit PosixRandom posix_random;
