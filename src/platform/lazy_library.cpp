@@ -1,16 +1,17 @@
 #include "platform/lazy_library.h"
 
-#include <dlfcn.h>
+#include "platform/dynlib.h"
 
 namespace zt_platform {
 
 void* LazyLibrary::address_of(const char* symbol)
 {
+    Dynlib& loader = Dynlib::current();
     if (!tried) {
         tried = true;
-        handle = ::dlopen(name, RTLD_NOW | RTLD_LOCAL);
+        handle = loader.open(name, Binding::Now);
     }
-    return handle ? ::dlsym(handle, symbol) : nullptr;
+    return handle ? loader.symbol(handle, symbol) : nullptr;
 }
 
 } // namespace zt_platform
