@@ -118,9 +118,11 @@ void KvoMat::Transform(const KvoVec4* points, KvoVec4* results,
 void KvoMat::Transform(const KvoVec3* points, KvoVec3* results,
                        std::size_t count) const
 {
+    if (count == 0)
+        return;
     const KvoMat m(*this); // which may be among the results
-    for (std::size_t i = 0; i < count; ++i)
-        results[i] = KvoVec3(KvoVec4(points[i]) * m);
+    zt_platform::PointLanes::current().transform3(&points->x, &results->x,
+                                                  count, &m.rows[0].x);
 }
 
 std::ostream& operator<<(std::ostream& stream, const KvoMat& m)

@@ -27,6 +27,13 @@ public:
     virtual void transform(const float* points, float* products,
                            std::size_t count, const float* matrix) const;
 
+    /// Does the same to points of three floats, each with a 1 behind it, and
+    /// drops the last element of the products.
+    ///
+    /// Requires: as above, with three floats for each.
+    virtual void transform3(const float* points, float* products,
+                            std::size_t count, const float* matrix) const;
+
     /// Gives what is in use: the fastest that this processor can do, or what a
     /// test installed.
     static const PointLanes& current();
@@ -42,26 +49,28 @@ public:
     /// Gives the fastest that this processor can do.
     static const PointLanes& fastest();
 
-    /// So many points fill a line of the cache.
+    /// So many points of four floats fill a line of the cache.
     static constexpr std::size_t points_in_line = 4;
+    static constexpr std::size_t floats_in_line = 16;
 
-    /// So far ahead of the point in hand memory is asked for the ones to come.
+    /// So far ahead of the float in hand memory is asked for the ones to come.
     /// Without it an array larger than the cache takes twice as long.
-    static constexpr std::size_t points_ahead = 32 * points_in_line;
+    static constexpr std::size_t floats_ahead = 32 * floats_in_line;
 
 protected:
     ~PointLanes() = default;
 
-    /// Asks for the line that will be needed later on. Always inline, since the
-    /// compiler takes it for a function without effect and drops its calls.
+    /// Asks for the line that will be needed later on, if there is one; `at`
+    /// and `count` are floats. Always inline, since the compiler takes it for a
+    /// function without effect and drops its calls.
     [[gnu::always_inline]] static void fetch_ahead(const float* points,
                                                    const float* products,
                                                    std::size_t at,
                                                    std::size_t count)
     {
-        if (count - at > points_ahead) {
-            __builtin_prefetch(points + 4 * (at + points_ahead), 0);
-            __builtin_prefetch(products + 4 * (at + points_ahead), 1);
+        if (count - at > floats_ahead) {
+            __builtin_prefetch(points + at + floats_ahead, 0);
+            __builtin_prefetch(products + at + floats_ahead, 1);
         }
     }
 };

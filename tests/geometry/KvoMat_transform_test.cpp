@@ -258,22 +258,32 @@ TEST(KvoMat, TransformOfNothingTouchesNothing)
     KvoMat().Transform(static_cast<const KvoVec3*>(nullptr), nullptr, 0);
 }
 
-TEST(KvoMat, TransformOfShortVectorsDropsTheWOfTheResults)
+TEST(KvoMat, TransformOfShortVectorsDropsTheWOfTheResultsInWhateverLanes)
 {
-    Samples samples;
-    const KvoMat m = KvoMat().InitPerspective(1, 1, 1, 100);
-    std::vector<KvoVec3> points(50);
-    for (KvoVec3& point : points)
-        point = samples.Vec3();
-    std::vector<KvoVec3> results(points.size());
-    std::vector<KvoVec3> changed = points;
+    using zt_platform::PointLanes;
+    for (const PointLanes* lanes :
+         {&PointLanes::plain(), &PointLanes::fastest()}) {
+        Samples samples;
+        PointLanes::install(lanes);
+        for (int round = 0; round < 60; ++round) {
+            const KvoMat m = round % 3 == 0   ? samples.Mat()
+                             : round % 3 == 1 ? samples.AnyMat()
+                                              : depth_to_w;
+            std::vector<KvoVec3> points;
+            for (const KvoVec4& point : AnyPoints(103))
+                points.push_back(KvoVec3(point));
+            std::vector<KvoVec3> results(points.size());
+            std::vector<KvoVec3> changed = points;
 
-    m.Transform(points.data(), results.data(), points.size());
-    m.Transform(changed.data(), changed.data(), changed.size());
+            m.Transform(points.data(), results.data(), points.size());
+            m.Transform(changed.data(), changed.data(), changed.size());
 
-    for (std::size_t i = 0; i < points.size(); ++i) {
-        const KvoVec3 want(literal::row_times(KvoVec4(points[i]), m));
-        EXPECT_TRUE(SameBits(results[i], want));
-        EXPECT_TRUE(SameBits(changed[i], want));
+            for (std::size_t i = 0; i < points.size(); ++i) {
+                const KvoVec3 want(literal::row_times(KvoVec4(points[i]), m));
+                EXPECT_TRUE(SameBits(results[i], want)) << lanes->name();
+                EXPECT_TRUE(SameBits(changed[i], want)) << lanes->name();
+            }
+        }
+        PointLanes::install(nullptr);
     }
 }

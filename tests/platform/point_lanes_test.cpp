@@ -1,6 +1,7 @@
 #include "platform/point_lanes.h"
 
 #include <cmath>
+#include <cstdint>
 #include <cstring>
 #include <limits>
 #include <random>
@@ -138,6 +139,86 @@ TEST_P(PointLanesTest, ArraysNeedNoAlignment)
     for (std::size_t i = 0; i < 20; ++i)
         ASSERT_TRUE(Same(&products[4 * i + 1],
                          Expected(&points[4 * i + 1], behind_first).data(), 4));
+}
+
+/// Three of the four elements of a point with a 1 behind it.
+Floats Expected3(const float* point, const Floats& matrix)
+{
+    const float four[] = {point[0], point[1], point[2], 1};
+    Floats product = Expected(four, matrix);
+    product.pop_back();
+    return product;
+}
+
+TEST_P(PointLanesTest, ProductsOfThreeHaveTheBitsOfTheFormulaForEveryCount)
+{
+    for (std::size_t count = 0; count < 300; ++count) {
+        const Floats matrix = Numbers(16);
+        const Floats points = Numbers(3 * count);
+        Floats products(3 * count + 1, 77);
+
+        lanes.transform3(points.data(), products.data(), count, matrix.data());
+
+        for (std::size_t i = 0; i < count; ++i)
+            ASSERT_TRUE(Same(&products[3 * i],
+                             Expected3(&points[3 * i], matrix).data(), 3))
+                << i << " of " << count;
+        ASSERT_EQ(products[3 * count], 77);
+    }
+}
+
+TEST_P(PointLanesTest, ProductsOfThreeAreDividedUnlessTheirLastIsZeroOrOne)
+{
+    // The last element of a product is z.
+    const Floats by_z = {1, 0, 0, 0, 0, 1, 0, 0, 0, 0, 1, 1, 0, 0, 0, 0};
+    Floats points;
+    Floats want;
+    for (float z :
+         {2.0f, 0.0f, 1.0f, -0.0f, -1.0f, 8.0f, 0.0f, 4.0f, 0.0f, 2.0f, 1.0f}) {
+        points.insert(points.end(), {2, 4, z});
+        want.insert(want.end(), {z == 0 ? 2 : 2 / z, z == 0 ? 4 : 4 / z,
+                                 z == 0 ? 0 : z / z});
+    }
+    Floats products(points.size());
+
+    lanes.transform3(points.data(), products.data(), 11, by_z.data());
+
+    EXPECT_TRUE(Same(products.data(), want.data(), want.size()));
+}
+
+TEST_P(PointLanesTest, ProductsOfThreeAreThoseOfTheFormulaForAnyBits)
+{
+    for (int round = 0; round < 2000; ++round) {
+        Floats matrix(16);
+        Floats points(3 * 17);
+        for (Floats* numbers : {&matrix, &points})
+            for (float& number : *numbers) {
+                const std::uint32_t bits = static_cast<std::uint32_t>(random());
+                std::memcpy(&number, &bits, sizeof number);
+                if (random() % 4 != 0)
+                    number = Number();
+            }
+        Floats products(points.size());
+
+        lanes.transform3(points.data(), products.data(), 17, matrix.data());
+
+        for (std::size_t i = 0; i < 17; ++i)
+            ASSERT_TRUE(Same(&products[3 * i],
+                             Expected3(&points[3 * i], matrix).data(), 3));
+    }
+}
+
+TEST_P(PointLanesTest, PointsOfThreeMayBeReplacedAndNeedNoAlignment)
+{
+    const Floats matrix = Numbers(17);
+    const Floats points = Numbers(3 * 203 + 1);
+    Floats separate(points.size());
+    Floats replaced = points;
+
+    lanes.transform3(&points[1], &separate[1], 203, &matrix[1]);
+    lanes.transform3(&replaced[1], &replaced[1], 203, &matrix[1]);
+
+    EXPECT_TRUE(Same(&replaced[1], &separate[1], separate.size() - 1));
 }
 
 TEST(PointLanes, TheFastestAreInUseUntilOthersAreInstalled)
