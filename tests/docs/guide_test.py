@@ -4,8 +4,8 @@ follows its links.
 Usage: guide_test.py PAGE TREE PREFIX LIBDIR COMPILER
 
 PREFIX is where the library is installed. All blocks of a page run in one
-temporary directory, in which `examples` is the project's. A block begins with
-the name of its language:
+temporary directory, in which `examples` and `plugins` are the project's, the
+latter for includes too. A block begins with the name of its language:
 
   cpp    a complete program: built against the installed library and run
   zt     a script: run by ztsh
@@ -62,7 +62,8 @@ class Page:
         self.compiler = compiler
         self.directory = directory
         self.count = 0
-        (directory / "examples").symlink_to(self.tree / "examples")
+        for folder in ("examples", "plugins"):
+            (directory / folder).symlink_to(self.tree / folder)
         self.environment = dict(
             os.environ, LC_ALL="C.UTF-8", HOME=str(directory),
             PATH=f"{prefix}/bin:{os.environ['PATH']}",
@@ -93,7 +94,7 @@ class Page:
         said, code = self.run(
             "sh", "-ec", f"flags=$(pkg-config --cflags --libs zt_util2)\n"
             f"eval \"'{self.compiler}' -std=c++20 -Wall -Wextra -Werror "
-            f"'{source}' -o '{source}.out' $flags\"")
+            f"-I. -Iplugins '{source}' -o '{source}.out' $flags\"")
         if code != 0:
             fail(place, f"does not compile:\n{said}")
         self.expect(place, *self.run(f"{source}.out"), marks, wanted)

@@ -18,8 +18,8 @@ PUBLIC = re.compile(
     r"guard variable for |VTT for |construction vtable for )?"
     r"(void |operator|bool |[\w:<>*& ]+ )?((Kvo|Zt)\w*|"
     + "|".join(CODEC + FREE) + r")\b"
-    # Stream operators, and what the inline formulas report through.
-    r"|^operator(<<|>>)\(std::[io]stream&, Kvo"
+    # Operators, and what the inline formulas report through.
+    r"|^operator[^\w(]+\((std::[io]stream&, )?Kvo"
     r"|^zt_geometry::(illegal_|division_by_)")
 # Templates of the standard library that the compiler puts into objects.
 STANDARD = re.compile(r"^((\w+ )*for )?[\w:<>*&, ]*(std::|__gnu_cxx::)")
