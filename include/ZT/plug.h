@@ -35,7 +35,7 @@ ZT_API void KvoInitializePlugin(ZtPlugCatalog* catalog);
 ///
 ///     ZT_PLUGIN("Recognizer:2.1", catalog)
 ///     {
-///         catalog->AddPlug("Edge", new EdgeFactory);
+///         catalog->OfferPlug("Edge", new EdgeFactory);
 ///     }
 #define ZT_PLUGIN(id, catalog)                                                 \
     extern "C" {                                                               \
@@ -117,6 +117,14 @@ public:
     /// Owner:    the plug, if it was made; otherwise the caller, as before.
     /// Returns:  the plug of that name; null when there is no memory.
     Plug* AddPlug(const char* name, KvoObject* object);
+
+    /// Registers an object as `AddPlug` does, or deletes it where that leaves
+    /// it to the caller.
+    ///
+    /// Requires: `object` comes from `new`, or is null.
+    /// Owner:    the catalog, in every case.
+    /// Returns:  the plug of that name; null when there is no memory.
+    Plug* OfferPlug(const char* name, KvoObject* object);
 
     /// Scans the directories of `path`, parted by ":", from left to right. An
     /// empty one, also the only or last one, is the current directory; null

@@ -95,6 +95,15 @@ ZtPlugCatalog::Plug* ZtPlugCatalog::AddPlug(const char* name, KvoObject* object)
     return plug;
 }
 
+ZtPlugCatalog::Plug* ZtPlugCatalog::OfferPlug(const char* name,
+                                              KvoObject* object)
+{
+    Plug* const plug = AddPlug(name, object);
+    if (!plug || plug->object != object)
+        delete object;
+    return plug;
+}
+
 ZtPlugCatalog::Plug* ZtPlugCatalog::FindPlug(const char* name)
 {
     return static_cast<Plug*>(plugs.Search(name));

@@ -154,6 +154,23 @@ TEST(ZtPlugCatalog, ATakenNameGivesThePlugAndLeavesTheObjectAlone)
     EXPECT_EQ(TakeTold(), Names{});
 }
 
+TEST(ZtPlugCatalog, AnOfferThatIsRefusedIsDeleted)
+{
+    TakeTold();
+    TestCatalog catalog;
+    ZtPlugCatalog::Plug* first =
+        catalog.OfferPlug("edge", new ToldObject("first deleted"));
+
+    ZtPlugCatalog::Plug* second =
+        catalog.OfferPlug("edge", new ToldObject("second deleted"));
+    catalog.OfferPlug("edge", nullptr);
+
+    EXPECT_EQ(second, first);
+    EXPECT_EQ(TakeTold(), (Names{"second deleted"}));
+    EXPECT_EQ(catalog.OfferPlug("edge", first->object), first);
+    EXPECT_EQ(TakeTold(), Names{});
+}
+
 TEST(ZtPlugCatalog, APlugIsFromTheDirectoryThatWasScannedLast)
 {
     PluginDir empty;

@@ -1,4 +1,5 @@
 #include "options.h"
+#include "plugins/plugin_command.h"
 #include "shell.h"
 
 #include <exception>
@@ -10,6 +11,8 @@ int main(int argc, char** argv)
         // Nothing here mixes these streams with stdio's input, and they are
         // faster on their own.
         std::ios::sync_with_stdio(false);
+        if (ztsh::IsPluginCommand(argc, argv))
+            return ztsh::RunPluginCommand(argc, argv);
         ztsh::Options options = ztsh::ReadOptions(argc, argv);
         if (options.finished)
             return options.code;

@@ -7,6 +7,7 @@
 #include "geometry/geometry.h"
 #include "options.h"
 #include "pictures/picture_table.h"
+#include "plugins/plugin_table.h"
 #include "script/runner.h"
 #include "time/clock_table.h"
 #include "words/beat_words.h"
@@ -15,6 +16,7 @@
 #include "words/geometry_words.h"
 #include "words/language_words.h"
 #include "words/picture_words.h"
+#include "words/plugin_words.h"
 #include "words/preference_words.h"
 #include "words/sequence_words.h"
 #include "words/shuttle_words.h"
@@ -43,6 +45,8 @@ private:
     PictureTable pictures;
     Geometry geometry;
     ClockTable clocks;
+    /// Whatever uses plug-ins stands behind it and goes before it.
+    PluginTable plugins{runner.dispatcher};
     CommonWords common;
     LanguageWords language;
     PictureWords picture_words;
@@ -55,6 +59,7 @@ private:
     ShuttleWords shuttles;
     GeometryWords geometry_words;
     WireWords wire_words;
+    PluginWords plugin_words{runner, plugins};
 };
 
 } // namespace ztsh

@@ -2,6 +2,6 @@
 
 ZT_PLUGIN("Test:2.1", catalog)
 {
-    catalog->AddPlug("", new ToldObject("nameless deleted"));
-    catalog->AddPlug(nullptr, nullptr);
+    catalog->OfferPlug("", new ToldObject("nameless deleted"));
+    catalog->OfferPlug(nullptr, nullptr);
 }

@@ -6,6 +6,6 @@ ToldClosing closing("entry_throws_late.so closed");
 
 ZT_PLUGIN("Test:2.1", catalog)
 {
-    catalog->AddPlug("late", new ToldObject("late deleted"));
+    catalog->OfferPlug("late", new ToldObject("late deleted"));
     throw 7;
 }

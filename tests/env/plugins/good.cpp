@@ -6,5 +6,5 @@ ToldClosing closing("good.so closed");
 
 ZT_PLUGIN("Test:2.1", catalog)
 {
-    catalog->AddPlug("good", new ToldObject("good deleted"));
+    catalog->OfferPlug("good", new ToldObject("good deleted"));
 }

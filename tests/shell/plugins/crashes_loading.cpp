@@ -1,0 +1,9 @@
+#include <ZT/plug.h>
+
+#include <csignal>
+
+ZT_PLUGIN(ZtDirectiveCatalog::plug_name, catalog)
+{
+    (void)catalog;
+    std::raise(SIGKILL);
+}

@@ -1,0 +1,3 @@
+#include <ZT/plug.h>
+
+extern "C" ZT_API void KvoInitializePlugin(ZtPlugCatalog*) {}

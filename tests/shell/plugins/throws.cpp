@@ -1,0 +1,7 @@
+#include <ZT/plug.h>
+
+ZT_PLUGIN(ZtDirectiveCatalog::plug_name, catalog)
+{
+    (void)catalog;
+    throw 1;
+}
