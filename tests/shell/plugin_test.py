@@ -63,6 +63,10 @@ class Check(PluginTest):
             (["has the id Directive:1.0", "registers Well", "all well"], [],
              0))
 
+    def test_the_kind_may_be_given_too(self):
+        self.assertEqual(
+            self.check(self.put("well"), "--kind", "directive")[2], 0)
+
     def test_a_bare_name_is_a_file_here(self):
         self.put("well")
         self.assertEqual(self.check("well.d.so")[2], 0)

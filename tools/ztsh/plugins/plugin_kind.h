@@ -15,7 +15,7 @@ struct PluginKind
     const char* suffix; ///< What their files end in.
 };
 
-constexpr PluginKind plugin_kinds[] = {
+inline constexpr PluginKind plugin_kinds[] = {
     {"directive", "Directive:1.0", ".d.so"},
     {"recognizer", "Recognizer:2.1", ".r.so"},
 };
