@@ -24,15 +24,18 @@ void Reception::Take(const char* bytes, std::size_t count)
         return;
     file->Write(bytes, part);
     count_so_far += part;
-    if (Complete())
-        why = file->Finish();
+    if (!Complete())
+        return;
+    why = file->Finish();
+    written = file->Name();
+    file.reset(); // A refused frame leaves nothing from now on.
 }
 
 std::string Reception::Line(const std::string& address) const
 {
     return "frame " + std::to_string(number()) + " from " + sender() + " (" +
            address +
-           "): " + (why.empty() ? "wrote " + file->Name() : "refused: " + why);
+           "): " + (why.empty() ? "wrote " + written : "refused: " + why);
 }
 
 /// Gives the number in the message, the most significant byte first.

@@ -47,7 +47,8 @@ private:
     const Storage& storage;
     char head[head_bytes] = {};
     std::size_t count_so_far = 0;
-    std::optional<FrameFile> file; ///< Once the head is complete.
+    std::optional<FrameFile> file; ///< From the end of the head to its own.
+    std::string written;           ///< The name of a frame in its place.
     std::string why;               ///< The frame was refused.
 };
 

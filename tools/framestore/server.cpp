@@ -14,12 +14,6 @@ constexpr std::size_t buffer_bytes = std::size_t{256} << 10;
 /// After so long a try to accept is repeated that the system had no room for.
 constexpr std::chrono::milliseconds patience(200);
 
-std::string bytes_of_message(std::size_t count)
-{
-    return std::to_string(count) + " of " + std::to_string(message_bytes) +
-           " bytes";
-}
-
 } // namespace
 
 Server::Server(const Settings& server_settings, std::ostream& server_log)
@@ -111,12 +105,8 @@ void Server::read(Client& client)
         reception.Take(buffer.data(), received.bytes);
     if (!client.answered && reception.Complete())
         finish(client);
-    if (!received.ended)
-        return;
-    client.gone = true;
-    if (!client.answered)
-        say(client.address + ": closed after " +
-            bytes_of_message(reception.Count()));
+    if (received.ended)
+        drop(client, "closed", "");
 }
 
 /// Answers. The connection is closed by the client: closed from here, what it
@@ -132,15 +122,21 @@ void Server::finish(Client& client)
 void Server::drop_late()
 {
     const Clock::time_point now = Clock::now();
-    for (Client& client : clients) {
-        if (client.gone || client.deadline > now)
-            continue;
-        client.gone = true;
-        if (!client.answered)
-            say(client.address + ": given up after " +
-                bytes_of_message(client.reception->Count()) +
-                ", it takes too long");
-    }
+    for (Client& client : clients)
+        if (!client.gone && client.deadline <= now)
+            drop(client, "given up", ", it takes too long");
+}
+
+/// Ends a connection, and then says so if that was too early.
+void Server::drop(Client& client, const char* end, const char* why)
+{
+    const std::size_t count = client.reception->Count();
+    client.reception.reset();
+    client.socket = Socket();
+    client.gone = true;
+    if (!client.answered)
+        say(client.address + ": " + end + " after " + std::to_string(count) +
+            " of " + std::to_string(message_bytes) + " bytes" + why);
 }
 
 void Server::say(const std::string& line)

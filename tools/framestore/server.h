@@ -29,7 +29,7 @@ struct Settings
     double timeout = 60; ///< Seconds that a client may take for everything.
 };
 
-/// Listens from its making on. A client takes less than a kilobyte of memory,
+/// Listens from its making on. A client takes about a kilobyte of memory,
 /// whatever it sends: frames are written as they come.
 class Server
 {
@@ -64,6 +64,7 @@ private:
     void read(Client& client);
     void finish(Client& client);
     void drop_late();
+    void drop(Client& client, const char* end, const char* why);
     void say(const std::string& line);
 
     const Settings& settings;
