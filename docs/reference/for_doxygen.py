@@ -86,6 +86,7 @@ def guide_of(lines, page):
         if heading and not in_code:
             line = f"{line} {{#{page}-{anchor_of(heading[2])}}}"
         elif not in_code:
+            line = re.sub(r"\]\(README[.]md", "](docs.md", line)
             line = re.sub(r"\]\(#", f"](#{page}-", line)
             line = re.sub(r"\]\((?:[\w./-]*/)?([\w-]+)\.md#", r"](#\1-", line)
         yield line
@@ -98,9 +99,11 @@ def main():
     for path in sources:
         lines = path.read_text(encoding="utf-8").splitlines()
         made = folder / path.relative_to(tree)
+        if path.stem == "README" and path.parent != tree:
+            made = made.with_stem(path.parent.name)  # there is one main page
         made.parent.mkdir(parents=True, exist_ok=True)
         lines = (headers_of(lines) if path.suffix == ".h" else
-                 guide_of(lines, path.stem))
+                 guide_of(lines, made.stem))
         made.write_text("\n".join(lines) + "\n", encoding="utf-8")
 
 

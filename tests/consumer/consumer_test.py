@@ -51,6 +51,10 @@ class Consumer:
             shutil.rmtree(place, ignore_errors=True)
         self.run("cmake", "--install", self.build, "--prefix", self.first)
         self.first.rename(self.prefix)
+        # Another name, for those who cannot have blanks in it.
+        plain = self.folder / "moved"
+        if not plain.is_symlink():
+            plain.symlink_to(self.prefix.name)
         for path in self.prefix.rglob("*"):
             if path.is_file() and path.suffix in (".cmake", ".pc", ".h"):
                 text = path.read_text(encoding="utf-8")
