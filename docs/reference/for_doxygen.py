@@ -87,6 +87,7 @@ def guide_of(lines, page):
             line = f"{line} {{#{page}-{anchor_of(heading[2])}}}"
         elif not in_code:
             line = re.sub(r"\]\(README[.]md", "](docs.md", line)
+            line = re.sub(r"(docs|examples)/README[.]md", r"\1/\1.md", line)
             line = re.sub(r"\]\(#", f"](#{page}-", line)
             line = re.sub(r"\]\((?:[\w./-]*/)?([\w-]+)\.md#", r"](#\1-", line)
         yield line

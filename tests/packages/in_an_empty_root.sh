@@ -45,6 +45,16 @@ python3 /src/tests/consumer/consumer_test.py add_subdirectory /src /work/build \
     c++ "$libdir"
 rm -rf /src/src /src/include /src/tools
 
+say "a plug-in"
+cd /work
+ztsh plugin new Outside >/dev/null
+cmake -G Ninja -S Outside -B build/Outside >>$log
+cmake --build build/Outside >>$log
+ctest --test-dir build/Outside >/work/said || { cat /work/said; exit 1; }
+[ "$(ztsh -c 'LoadPlugins build/Outside; Outside there' 2>&1 |
+    tail -n 1)" = "Outside says hello to there" ]
+ztsh -c 'LoadPlugins; Plugins' | grep -q edge
+
 say "the examples"
 for source in "$documents"/examples/*.cpp; do
     name=$(basename "$source" .cpp)
