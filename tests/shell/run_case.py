@@ -1,7 +1,7 @@
 """Runs one case: the shell with the arguments, files and input that the case
 names, and compares what it writes and how it ends.
 
-Usage: run_case.py SHELL TREE CASE
+Usage: run_case.py SHELL TREE CASE [NAME=PLACE...]
 
 A case is a text of sections, each begun by a line "--- NAME". What stands
 before the first section says what the case shows.
@@ -18,7 +18,8 @@ before the first section says what the case shows.
   --- made        files that must be there afterwards, one a line
 
 In all of them {dir} is the directory that the shell runs in, {tree} the
-project's and {shell} the shell itself. In output and errors {number} stands
+project's and {shell} the shell itself, and {NAME} each place that the command
+line names. In output and errors {number} stands
 for any number and {any} for any text up to the end of the line. {rest} stands
 for whatever follows. The mark
 <no newline> at the end of a line of a file or of the input joins it to what
@@ -63,10 +64,13 @@ def bytes_of(text):
     return made
 
 
-def run(shell, tree, case, directory):
+def run(shell, tree, case, directory, named):
     texts = {"args": "", "input": "", "output": "", "errors": "", "exit": "0",
              "made": "", "environment": ""}
     places = {"{dir}": str(directory), "{tree}": tree, "{shell}": shell}
+    for place in named:
+        name, _, path = place.partition("=")
+        places["{" + name + "}"] = path
     for name, text in sections_of(case):
         for mark, place in places.items():
             text = text.replace(mark, place)
@@ -108,10 +112,10 @@ def run(shell, tree, case, directory):
 
 
 def main():
-    shell, tree, case = sys.argv[1:]
+    shell, tree, case, *named = sys.argv[1:]
     with tempfile.TemporaryDirectory(prefix="zt_case_") as name:
         directory = pathlib.Path(name).resolve()
-        faults = run(shell, tree, pathlib.Path(case), directory)
+        faults = run(shell, tree, pathlib.Path(case), directory, named)
     print("\n".join(faults) or "as it should be")
     return 1 if faults else 0
 

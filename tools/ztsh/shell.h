@@ -18,6 +18,7 @@
 #include "words/picture_words.h"
 #include "words/plugin_words.h"
 #include "words/preference_words.h"
+#include "words/recognizer_words.h"
 #include "words/sequence_words.h"
 #include "words/shuttle_words.h"
 #include "words/time_words.h"
@@ -60,6 +61,7 @@ private:
     GeometryWords geometry_words;
     WireWords wire_words;
     PluginWords plugin_words{runner, plugins};
+    RecognizerWords recognizer_words{runner, pictures, plugins.recognizers};
 };
 
 } // namespace ztsh

@@ -2,6 +2,7 @@
 
 #include "common/png_file.h"
 #include "pictures/best_scale.h"
+#include "pictures/picture_drawing.h"
 #include "pictures/picture_files.h"
 #include "pictures/terminal_picture.h"
 #include "system/terminal.h"
@@ -25,6 +26,7 @@ enum Selector : int {
     Png,
     Show,
     Copy,
+    PasteWord,
     Free,
     Pictures
 };
@@ -53,6 +55,11 @@ const std::vector<Word> words = {
     {"Show", "NAME", "Shows a picture in the terminal, as large as fits.", 1,
      1},
     {"Copy", "FROM TO", "Makes a second picture TO like FROM.", 2, 2},
+    {"Paste", "FROM INTO X Y",
+     "Puts the picture FROM into INTO, its lower left corner X pixels from "
+     "the\n"
+     "left and Y from the bottom; what does not fit is left out.",
+     4, 4},
     {"Free", "NAME", "Forgets a picture.", 1, 1},
     {"Pictures", "", "Lists the pictures.", 0, 0},
 };
@@ -109,6 +116,9 @@ void PictureWords::Do(KvoStatement& statement, int selector)
         break;
     case Copy:
         copy(first, statement.ArgText(2));
+        break;
+    case PasteWord:
+        paste(statement);
         break;
     case Free:
         if (find(words[Free].name, first))
@@ -222,6 +232,31 @@ void PictureWords::copy(const char* from, const char* to)
 {
     if (find(words[Copy].name, from))
         pictures.Copy(from, to);
+}
+
+void PictureWords::paste(const KvoStatement& statement)
+{
+    constexpr long most = 65535;
+    const char* word = words[PasteWord].name;
+    const char* into = statement.ArgText(2);
+    long x = 0;
+    long y = 0;
+    if (!ReadNumber(statement.ArgText(3), -most, most, x) ||
+        !ReadNumber(statement.ArgText(4), -most, most, y)) {
+        ZtError("%s: expected a place of -%ld to %ld pixels, not %s and %s\n",
+                word, most, most, statement.ArgText(3), statement.ArgText(4));
+        return;
+    }
+    const Picture* from = find(word, statement.ArgText(1));
+    if (!from || !find(word, into))
+        return;
+    // A picture may be put into itself.
+    const ZtImageSGI pasted(from->image);
+    Picture* picture = pictures.FindToChange(into);
+    if (picture && (pasted.pixels || !from->image.pixels))
+        Paste(picture->image, pasted, static_cast<int>(x), static_cast<int>(y));
+    else
+        ZtError("%s: not enough memory\n", word);
 }
 
 void PictureWords::list()

@@ -10,8 +10,8 @@
 
 namespace ztsh {
 
-/// Load, Info, Resize, ResizeBest, ScaleBest, Store, Png, Show, Copy, Free and
-/// Pictures.
+/// Load, Info, Resize, ResizeBest, ScaleBest, Store, Png, Show, Copy, Paste,
+/// Free and Pictures.
 class PictureWords : public WordDirector
 {
 public:
@@ -29,6 +29,7 @@ private:
     void write(KvoStatement& statement, int selector);
     void show(const char* name);
     void copy(const char* from, const char* to);
+    void paste(const KvoStatement& statement);
     void list();
 
     Runner& runner;
