@@ -53,7 +53,8 @@ public:
     /// Opens the shared object at `path`; its names stay its own. Opening one
     /// that is open already gives the same handle once more.
     ///
-    /// Requires: a path with a slash; others are looked for elsewhere.
+    /// A name without a slash is looked for where the system keeps libraries.
+    ///
     /// Returns:  a handle, or null with the reason in `error_text`.
     virtual void* open(const char* path, Binding binding) = 0;
 
