@@ -4,6 +4,7 @@
 
 #include "KVO/KvoVec.h"
 #include "geometry/components.h"
+#include "geometry/literal.h"
 #include "geometry/reference.h"
 #include "geometry/samples.h"
 #include "support/ErrorTrap.h"
@@ -123,6 +124,26 @@ TEST(KvoMat, DegreesBecomeRadiansInDoublePrecision)
     }
 }
 
+TEST(KvoMat, InitRotateFollowsTheFormulaInWrittenOrder)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoVec3 axis = samples.Vec3();
+        const float degrees = samples.Number(720);
+        const float radians =
+            static_cast<float>(double(degrees) * 0.017453292519943295);
+        const float c = cosf(radians), s = sinf(radians), t = 1 - c;
+        const KvoVec3 u = KvoVec3(axis).Unit();
+        const float x = u.x, y = u.y, z = u.z;
+        const KvoMat want(
+            KvoVec3(t * x * x + c, t * x * y + s * z, t * x * z - s * y),
+            KvoVec3(t * x * y - s * z, t * y * y + c, t * y * z + s * x),
+            KvoVec3(t * x * z + s * y, t * y * z - s * x, t * z * z + c));
+
+        EXPECT_TRUE(SameBits(KvoMat().InitRotate(axis, degrees), want));
+    }
+}
+
 TEST(KvoMat, InitRotateLeavesTheAxisAndTheFourthColumn)
 {
     KvoMat m = Used();
@@ -230,6 +251,74 @@ TEST(KvoMat, InitOrtho2TurnsZRoundAndMovesItNowhere)
     EXPECT_TRUE(
         SameBits(m, KvoMat(KvoVec4(0.5, 0, 0, 0), KvoVec4(0, 0.25, 0, 0),
                            KvoVec4(0, 0, -1, 0), KvoVec4(-0.5, -0.5, 0, 1))));
+}
+
+TEST(KvoMat, ProjectionsFollowTheirFormulasInWrittenOrder)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const float left = samples.Number(), right = samples.Number();
+        const float bottom = samples.Number(), top = samples.Number();
+        const float near = samples.Number(), far = samples.Number();
+        const float fovy = samples.Number(), aspect = samples.Number();
+        const KvoMat perspective(
+            KvoVec4((1 / tanf(fovy / 2)) / aspect, 0, 0, 0),
+            KvoVec4(0, 1 / tanf(fovy / 2), 0, 0),
+            KvoVec4(0, 0, -(far + near) / (far - near), -1),
+            KvoVec4(0, 0, -(2 * far * near) / (far - near), 0));
+        const KvoMat window(KvoVec4(2 * near / (right - left), 0, 0, 0),
+                            KvoVec4(0, 2 * near / (top - bottom), 0, 0),
+                            KvoVec4((right + left) / (right - left),
+                                    (top + bottom) / (top - bottom),
+                                    -(far + near) / (far - near), -1),
+                            KvoVec4(0, 0, -(2 * far * near) / (far - near), 0));
+        KvoMat ortho(KvoVec4(2 / (right - left), 0, 0, 0),
+                     KvoVec4(0, 2 / (top - bottom), 0, 0),
+                     KvoVec4(0, 0, -2 / (far - near), 0),
+                     KvoVec4(-(right + left) / (right - left),
+                             -(top + bottom) / (top - bottom),
+                             -(far + near) / (far - near), 1));
+
+        EXPECT_TRUE(SameBits(KvoMat().InitPerspective(fovy, aspect, near, far),
+                             perspective));
+        EXPECT_TRUE(SameBits(
+            KvoMat().InitWindow(left, right, bottom, top, near, far), window));
+        EXPECT_TRUE(SameBits(
+            KvoMat().InitOrtho(left, right, bottom, top, near, far), ortho));
+        ortho[2][2] = -1;
+        ortho[3][2] = 0;
+        EXPECT_TRUE(
+            SameBits(KvoMat().InitOrtho2(left, right, bottom, top), ortho));
+    }
+}
+
+TEST(KvoMat, ViewsFollowTheirStepsInWrittenOrder)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoVec3 view = samples.Vec3(10), point = samples.Vec3(10);
+        const float twist = samples.Number(180);
+        const float azim = samples.Number(180), inc = samples.Number(180);
+        const KvoVec3 v = point - view;
+        const float h = sqrtf(v.x * v.x + v.z * v.z);
+        const float d = sqrtf(v.x * v.x + v.y * v.y + v.z * v.z);
+        KvoMat first, second;
+        first[0] = KvoVec4(-v.z / h, 0, -v.x / h, 0);
+        first[2] = KvoVec4(v.x / h, 0, -v.z / h, 0);
+        second[1] = KvoVec4(0, h / d, -v.y / d, 0);
+        second[2] = KvoVec4(0, v.y / d, h / d, 0);
+        KvoMat lookat = literal::product(KvoMat().InitTrans(-view), first);
+        lookat = literal::product(lookat, second).Zrot(-twist, 1);
+        KvoMat polarview;
+        polarview.InitZrot(-azim);
+        polarview.Xrot(-inc, 0);
+        polarview.Zrot(-twist, 0);
+        polarview.Trans(0, 0, -view.x, 0);
+
+        EXPECT_TRUE(SameBits(KvoMat().InitLookat(view, point, twist), lookat));
+        EXPECT_TRUE(SameBits(KvoMat().InitPolarview(view.x, azim, inc, twist),
+                             polarview));
+    }
 }
 
 TEST(KvoMat, InitPolarviewSwingsRoundTheOrigin)

@@ -236,6 +236,43 @@ TEST(KvoQuat, OfAMatrixCountsATraceWithinTheToleranceAsNone)
     ExpectNear(KvoQuat(m), {0, std::sqrt(0.5), 0, 0}, 1e-6);
 }
 
+TEST(KvoQuat, OfAMatrixCountsWhatIsWithinTheToleranceAsNoneAtEveryStep)
+{
+    const float less = std::nextafter(epsilon, 0.0f);
+    // Without a trace to speak of: the second step takes half of what is
+    // missing in y and z for x x, the third half of what is missing in z.
+    const auto of_y_and_z = [](float y, float z) {
+        return KvoQuat(KvoMat().InitScale(-1, y, z));
+    };
+
+    EXPECT_EQ(of_y_and_z(-2 * epsilon, 0).v.x, sqrtf(epsilon));
+    EXPECT_TRUE(std::isnan(of_y_and_z(2 * epsilon, 0).v.x));
+    EXPECT_EQ(Components(of_y_and_z(-2 * less, 0)),
+              (Four{0, 0, sqrtf(0.5f), 0}));
+    EXPECT_EQ(Components(of_y_and_z(2 * less, 0)),
+              (Four{0, 0, sqrtf(0.5f), 0}));
+    EXPECT_EQ(of_y_and_z(2 * epsilon - 1, 1 - 2 * epsilon).v.y, sqrtf(epsilon));
+    EXPECT_EQ(Components(of_y_and_z(epsilon - 1, 1 - epsilon)),
+              (Four{0, 0, 0, 1}));
+}
+
+TEST(KvoQuat, OfAMatrixFollowsTheFormulaInWrittenOrder)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoMat m = KvoMat(samples.Rotation());
+        const float t = (m[0][0] + 1 + m[1][1] + m[2][2]) * 0.25f;
+        if (t < 0.01f)
+            continue;
+        const float s = sqrtf(t);
+
+        EXPECT_EQ(Components(KvoQuat(m)),
+                  (Four{s, (m[1][2] - m[2][1]) / (4 * s),
+                        (m[2][0] - m[0][2]) / (4 * s),
+                        (m[0][1] - m[1][0]) / (4 * s)}));
+    }
+}
+
 // Length, middle, reflection.
 
 TEST(KvoQuat, NormalizeDividesByTheLength)
@@ -317,6 +354,30 @@ TEST(KvoQuat, QdoubleGoesAsFarOnTheOtherSide)
     }
 }
 
+TEST(KvoQuat, MiddleAndReflectionFollowTheirFormulasInWrittenOrder)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoQuat p(samples.Vec4());
+        const KvoQuat q(samples.Vec4());
+        const KvoQuat sum(p.s + q.s, p.v + q.v);
+        const float length = sqrtf(sum.s * sum.s + sum.v.x * sum.v.x +
+                                   sum.v.y * sum.v.y + sum.v.z * sum.v.z);
+        const float d =
+            2 * ((p.v.x * q.v.x + p.v.y * q.v.y + p.v.z * q.v.z) + p.s * q.s);
+        KvoQuat unit = sum;
+        unit.Normalize();
+
+        EXPECT_EQ(Components(p.qbisect(q)),
+                  (Four{sum.s / length, sum.v.x / length, sum.v.y / length,
+                        sum.v.z / length}));
+        EXPECT_TRUE(SameBits(unit, p.qbisect(q)));
+        EXPECT_EQ(Components(p.qdouble(q)),
+                  (Four{d * q.s - p.s, d * q.v.x - p.v.x, d * q.v.y - p.v.y,
+                        d * q.v.z - p.v.z}));
+    }
+}
+
 // Sum and product.
 
 TEST(KvoQuat, SumGoesPartByPart)
@@ -365,6 +426,23 @@ TEST(KvoQuat, ProductIsThatOfDoubles)
             {a * e - b * f - c * g - d * h, a * f + b * e + c * h - d * g,
              a * g - b * h + c * e + d * f, a * h + b * g - c * f + d * e},
             1e-5);
+    }
+}
+
+TEST(KvoQuat, ProductFollowsTheFormulaInWrittenOrder)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoQuat a(samples.Vec4());
+        const KvoQuat b(samples.Vec4());
+        const KvoVec3 cross = a.v.Cross(b.v);
+
+        EXPECT_EQ(
+            Components(a * b),
+            (Four{a.s * b.s - (a.v.x * b.v.x + a.v.y * b.v.y + a.v.z * b.v.z),
+                  a.s * b.v.x + b.s * a.v.x + cross.x,
+                  a.s * b.v.y + b.s * a.v.y + cross.y,
+                  a.s * b.v.z + b.s * a.v.z + cross.z}));
     }
 }
 
@@ -452,7 +530,8 @@ TEST(KvoQuat, InterpGivesTheKeysThemselvesAtTheEnds)
     const KvoQuat q0 = samples.Rotation(), q1 = samples.Rotation();
     const KvoQuat q2 = samples.Rotation(), q3 = samples.Rotation();
 
-    for (const float t : {0.0f, -0.5f, 1e-8f, -1e-8f, -100.0f})
+    for (const float t :
+         {0.0f, -0.5f, 1e-8f, -1e-8f, -100.0f, std::nextafter(epsilon, 0.0f)})
         EXPECT_TRUE(SameBits(Interp(q0, q1, q2, q3, t), q1)) << t;
     for (const float t : {1.0f, 2.0f, 1 - epsilon / 2, 1 + epsilon, 1e9f})
         EXPECT_TRUE(SameBits(Interp(q0, q1, q2, q3, t), q2)) << t;

@@ -299,6 +299,27 @@ TEST(KvoVec3, ScaleMultipliesByOneQuotient)
     }
 }
 
+TEST(KvoVec4, LengthAndDirectionHaveTheBitsOfTheFormula)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoVec4 v = samples.Vec4();
+        const float squared = v.x * v.x + v.y * v.y + v.z * v.z + v.w * v.w;
+        const float length = sqrtf(squared);
+        const float factor = 3 / length;
+        const KvoVec4 divided(v.x / length, v.y / length, v.z / length,
+                              v.w / length);
+
+        EXPECT_EQ(v.MagSquared(), squared);
+        EXPECT_EQ(v.Mag(), length);
+        EXPECT_TRUE(SameBits(v.Dir(), divided));
+        EXPECT_TRUE(SameBits(KvoVec4(v).Unit(), divided));
+        EXPECT_TRUE(
+            SameBits(KvoVec4(v).Scale(3), KvoVec4(v.x * factor, v.y * factor,
+                                                  v.z * factor, v.w * factor)));
+    }
+}
+
 // Directions as matrix and angles.
 
 TEST(KvoVec3, VecToRotmatrixTakesTheZAxisIntoTheDirection)
@@ -320,6 +341,21 @@ TEST(KvoVec3, VecToRotmatrixTakesTheZAxisIntoTheDirection)
         for (int r = 0; r < 4; ++r)
             for (int c = 0; c < 4; ++c)
                 EXPECT_NEAR(m[r][c], want[r][c], 2e-6 / d);
+    }
+}
+
+TEST(KvoVec3, VecToRotmatrixFollowsTheFormulaInWrittenOrder)
+{
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoVec3 v = samples.Vec3();
+        const KvoVec3 u = KvoVec3(v).Unit();
+        const float d = sqrtf(u.y * u.y + u.z * u.z);
+        const KvoMat want(KvoVec4(d, -(u.x * u.y) / d, -(u.x * u.z) / d, 0),
+                          KvoVec4(0, u.z / d, -u.y / d, 0),
+                          KvoVec4(u.x, u.y, u.z, 1), KvoVec4(0, 0, 0, 1));
+
+        EXPECT_TRUE(SameBits(v.VecToRotmatrix(), want));
     }
 }
 
@@ -368,6 +404,24 @@ TEST(KvoVec3, VecToAnglesGivesDegreesAndAThirdOfZero)
         EXPECT_NEAR(angles.y, -std::atan2(double(v.z), v.x) * 180 / M_PI, 1e-3);
         EXPECT_EQ(angles.z, 0);
     }
+}
+
+TEST(KvoVec3, VecToAnglesTakesTheUnitVectorAndADoubleProduct)
+{
+    constexpr double factor = 57.29577951308232;
+    Samples samples;
+    for (int i = 0; i < 2000; ++i) {
+        const KvoVec3 v = samples.Vec3();
+        const KvoVec3 u = KvoVec3(v).Unit();
+
+        const KvoVec3 angles = v.VecToAngles();
+
+        EXPECT_EQ(angles.x, static_cast<float>(-atan2f(u.z, u.y) * factor));
+        EXPECT_EQ(angles.y, static_cast<float>(-atan2f(u.z, u.x) * factor));
+    }
+    // Its length is infinite, so that nothing is left of its direction.
+    EXPECT_EQ(Components(KvoVec3(0, 1e30f, 1e30f).VecToAngles()),
+              (Three{0, 0, 0}));
 }
 
 // Free operators.

@@ -2,6 +2,7 @@
 
 #include "picture_recognizer.h"
 
+#include <dlfcn.h>
 #include <filesystem>
 #include <memory>
 
@@ -33,6 +34,28 @@ TEST_F(EdgePlugin, StaysWhatItIsWhenItIsScannedAgain)
 
     EXPECT_STREQ(catalog.HeadKey(), "edge");
     EXPECT_EQ(catalog.NextKey(), nullptr);
+}
+
+TEST(edge_plugin, IsUnloadedWithItsCatalog)
+{
+    const char* const file = EDGE_DIRECTORY "/edge.r.so";
+    {
+        KvoRecognizerCatalog catalog;
+        catalog.ScanDirectory(EDGE_DIRECTORY);
+        std::unique_ptr<KvoRecognizer> edge(catalog.FetchRecognizer("edge"));
+        ASSERT_NE(edge, nullptr);
+        edge.reset();
+        void* const loaded = dlopen(file, RTLD_LAZY | RTLD_NOLOAD);
+        ASSERT_NE(loaded, nullptr);
+        dlclose(loaded);
+    }
+    EXPECT_EQ(dlopen(file, RTLD_LAZY | RTLD_NOLOAD), nullptr);
+}
+
+TEST_F(EdgePlugin, HasItsHelpBesideIt)
+{
+    EXPECT_STREQ(catalog.FindPlugHelpFilename("edge", "txt"),
+                 EDGE_DIRECTORY "/Help/edge.r.txt");
 }
 
 TEST_F(EdgePlugin, FindsThePictureOfATargetInAFrame)
