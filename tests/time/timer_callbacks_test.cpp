@@ -381,6 +381,32 @@ TEST_F(TimerCallbacks, AllTimersStandAtTheirNewTimesWhenTheFirstIsCalled)
     EXPECT_EQ(seen, ticks_a_beat);
 }
 
+// It is neither running nor stopped until the walk comes to its own slot.
+TEST_F(TimerCallbacks, ATimerThatEndsInThisBeatCannotBeReversedYet)
+{
+    static ZtTimer* later;
+    static int seen;
+    ZtTimer first;
+    ZtTimer second(KvoTime(), Ticks(ticks_a_beat));
+    later = &second;
+    seen = -1;
+    first.post_trigger(
+        [](ZtTimer*, void*) {
+            seen = later->state;
+            later->reverse();
+        },
+        nullptr, Ticks(ticks_a_beat));
+    first.start();
+    second.start();
+
+    Beats(3);
+
+    EXPECT_EQ(seen, ZtTimer::Ended);
+    EXPECT_EQ(second.state, ZtTimer::Stopped);
+    EXPECT_EQ(second.start_time, KvoTime());
+    EXPECT_EQ(second.end, Ticks(ticks_a_beat));
+}
+
 TEST_F(TimerCallbacks, UnpostRemovesTheFirstMatchOnly)
 {
     ZtTimer timer;

@@ -244,7 +244,8 @@ std::optional<Value> ExpressionReader::numbers(std::size_t count)
 std::optional<Value> ExpressionReader::all_numbers()
 {
     std::size_t count = numbers_ahead();
-    for (std::size_t known : {1, 3, 4, 9, 12, 16})
+    constexpr std::size_t counts[] = {1, 3, 4, 9, 12, 16};
+    for (std::size_t known : counts)
         if (count == known)
             return numbers(count);
     return fail(std::to_string(count) +
