@@ -194,8 +194,11 @@ public:
     /// slash only that is searched; otherwise that one within the plug's
     /// directory, then the plug's directory itself.
     ///
-    /// Owner:   a temporary string, which lives through 99 further ones.
-    /// Returns: the path; null if there is no such plug or no such file.
+    /// Owner:     a temporary string, which lives through 99 further ones.
+    /// Returns:   the path; null if there is no such plug or no such file.
+    /// By design: paths are made with ZtFilePath, which loses blanks, so there
+    ///            is no help in a directory with a blank in its name
+    ///            (PlugHelp.IsNotFoundInADirectoryWithABlank).
     const char* FindPlugHelpFilename(const char* name, const char* extension);
 
     /// Does something about a plug that has just been added; the base does

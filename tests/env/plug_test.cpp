@@ -411,6 +411,18 @@ TEST_F(PlugHelp, AnEmptyVariableIsADirectoryOfNoName)
     EXPECT_EQ(Found("html"), "edge.t.html");
 }
 
+TEST_F(PlugHelp, IsNotFoundInADirectoryWithABlank)
+{
+    const std::string blank = dir.Path("a blank");
+    std::filesystem::create_directory(blank);
+    dir.Write("a blank/edge.t.html", "");
+    TestCatalog other;
+    other.ScanOneDir(blank.c_str());
+    other.AddPlug("edge", nullptr);
+
+    EXPECT_EQ(other.FindPlugHelpFilename("edge", "html"), nullptr);
+}
+
 TEST_F(PlugHelp, IsATemporaryString)
 {
     dir.Write("Help/edge.t.html", "");
