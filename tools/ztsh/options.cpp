@@ -15,6 +15,8 @@ namespace {
 /// As many as the stack surely has room for.
 constexpr int most_includes_allowed = 1000;
 constexpr int most_jobs_allowed = 256;
+constexpr double shortest_timeout = 0.01;
+constexpr double longest_timeout = 86400;
 
 constexpr const char* footer =
     "Without scripts and -c, statements come from standard input: from a\n"
@@ -70,6 +72,11 @@ void AddOptions(CLI::App& app, Options& options)
                    "itself (default: the cores)")
         ->option_text("N")
         ->check(CLI::Range(1, most_jobs_allowed));
+    app.add_option("--ddr-timeout", options.settings.ddr_timeout,
+                   "Seconds that sending a frame to the frame store may take "
+                   "(default: as long as it takes)")
+        ->option_text("SECONDS")
+        ->check(CLI::Range(shortest_timeout, longest_timeout));
     zt_pages::AddPageOption(app, options.page);
 }
 

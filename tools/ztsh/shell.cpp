@@ -18,10 +18,11 @@ constexpr int input_descriptor = 0;
 
 Shell::Shell(const Settings& settings)
     : runner(settings), common(runner), language(runner),
-      picture_words(runner, pictures), preferences(runner),
-      sequences(runner, pictures, geometry), times(runner), beat(runner),
-      clock_words(runner, clocks), wait(runner, clocks), shuttles(runner),
-      geometry_words(runner, geometry), wire_words(runner, geometry, pictures)
+      picture_words(runner, pictures), frame_store(runner, pictures),
+      preferences(runner), sequences(runner, pictures, geometry), times(runner),
+      beat(runner), clock_words(runner, clocks), wait(runner, clocks),
+      shuttles(runner), geometry_words(runner, geometry),
+      wire_words(runner, geometry, pictures)
 {
     runner.RunWhenDue(&clocks);
     SurviveOverlongRows();

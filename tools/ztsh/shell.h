@@ -13,6 +13,7 @@
 #include "words/beat_words.h"
 #include "words/clock_words.h"
 #include "words/common_words.h"
+#include "words/frame_store_words.h"
 #include "words/geometry_words.h"
 #include "words/language_words.h"
 #include "words/picture_words.h"
@@ -51,6 +52,7 @@ private:
     CommonWords common;
     LanguageWords language;
     PictureWords picture_words;
+    FrameStoreWords frame_store;
     PreferenceWords preferences;
     SequenceWords sequences;
     TimeWords times;

@@ -27,6 +27,7 @@ struct Settings
     bool safe = false;
     int most_includes = 200; ///< Scripts within each other.
     int jobs = 1;            ///< Worker processes of a sequence.
+    double ddr_timeout = 0;  ///< Seconds for a frame to be sent; 0 is any.
 };
 
 /// What came of an `Include`.
