@@ -66,6 +66,21 @@ bool NewFile::append(const void* from, std::size_t bytes)
     return sound;
 }
 
+bool NewFile::rewrite_beginning(const void* from, std::size_t bytes)
+{
+    sound = sound && is_open();
+    std::size_t done = place ? 0 : bytes;
+    while (sound && done < bytes) {
+        const std::ptrdiff_t went = Files::current().write_at(
+            handle, static_cast<const char*>(from) + done, bytes - done, done);
+        if (went > 0)
+            done += static_cast<std::size_t>(went);
+        else if (went == 0 || errno != EINTR)
+            sound = false;
+    }
+    return sound;
+}
+
 bool NewFile::finish()
 {
     if (handle < 0)

@@ -35,6 +35,12 @@ public:
     /// Returns: false when any byte so far could not be written.
     bool append(const void* from, std::size_t bytes);
 
+    /// Writes the first bytes of the file anew, of which there are at least so
+    /// many; a device or a pipe keeps what it was given.
+    ///
+    /// Returns: false when any byte so far could not be written.
+    bool rewrite_beginning(const void* from, std::size_t bytes);
+
     /// Closes the file and puts it in its place.
     ///
     /// Returns: true when every byte was kept; otherwise nothing of it is left

@@ -37,6 +37,7 @@ bool PacedPort::open(const AudioPortConfig& wanted)
     config.channels = wanted.channels;
     config.format = wanted.format;
     config.width = wanted.width;
+    config.rate = wanted.rate;
     queue.drop(queue.filled());
     rate = current_rate();
     since = Clock::current().steady_nanoseconds();

@@ -3,30 +3,19 @@
 #include "platform/byte_order.h"
 #include "platform/new_file.h"
 #include "platform/sample_lanes.h"
+#include "sound/aifc_header.h"
 #include "sound/sample_buffer.h"
 
 #include <algorithm>
-#include <bit>
 #include <cstring>
 #include <memory>
 #include <new>
-
-// A FORM of four chunks: the version of the format, what the samples are, and
-// the samples themselves. Sizes count what follows them, a chunk of an odd
-// size is followed by a zero that no size counts but the FORM's.
 
 namespace zt_sound {
 
 namespace {
 
 using zt_platform::store_big_16;
-using zt_platform::store_big_32;
-
-constexpr std::size_t header_bytes = 86;
-constexpr std::uint32_t format_version = 0xA2805140;
-constexpr const char* compression = "NONE\016not compressed";
-constexpr std::size_t compression_bytes = 20; ///< With the zero that pads it.
-constexpr std::uint64_t largest_form = 0xFFFFFFFF;
 
 /// Bytes that are made at a time; a multiple of every sample's width.
 constexpr std::size_t block_bytes = std::size_t{3} << 16;
@@ -43,80 +32,6 @@ std::size_t sample_bytes(const KvoSound& sound)
         return 2;
     }
 }
-
-/// Writes a whole number in the extended form of 80 bits: a sign, 15 bits of
-/// exponent, and 64 bits whose first one stands for 2^exponent.
-void store_extended(unsigned char* bytes, long value)
-{
-    constexpr int bias = 16383;
-    constexpr int last_bit = 63;
-    constexpr unsigned negative = 0x8000;
-    std::memset(bytes, 0, 10);
-    if (value == 0)
-        return;
-    const auto size = value < 0 ? 0 - static_cast<std::uint64_t>(value)
-                                : static_cast<std::uint64_t>(value);
-    const int shift = std::countl_zero(size);
-    const std::uint64_t mantissa = size << shift;
-    store_big_16(bytes, static_cast<std::uint16_t>(
-                            static_cast<unsigned>(bias + last_bit - shift) |
-                            (value < 0 ? negative : 0)));
-    store_big_32(bytes + 2, static_cast<std::uint32_t>(mantissa >> 32));
-    store_big_32(bytes + 6, static_cast<std::uint32_t>(mantissa));
-}
-
-/// The bytes before the samples, put one behind the other.
-class Header
-{
-public:
-    Header(const KvoSound& sound, std::uint32_t data_bytes) : at(bytes)
-    {
-        constexpr std::uint32_t rest_of_sound = 8;
-        name("FORM");
-        number_32(static_cast<std::uint32_t>(header_bytes) - 8 + data_bytes +
-                  data_bytes % 2);
-        name("AIFC");
-        name("FVER");
-        number_32(4);
-        number_32(format_version);
-        name("COMM");
-        number_32(18 + compression_bytes);
-        number_16(static_cast<std::uint16_t>(samples_in_frame(sound)));
-        number_32(static_cast<std::uint32_t>(frames_of(sound)));
-        number_16(static_cast<std::uint16_t>(8 * sample_bytes(sound)));
-        store_extended(at, sound.rate);
-        at += 10;
-        std::memcpy(at, compression, compression_bytes);
-        at += compression_bytes;
-        name("SSND");
-        number_32(rest_of_sound + data_bytes);
-        number_32(0); // Offset of the first sample.
-        number_32(0); // Samples are not aligned to blocks.
-    }
-
-    unsigned char bytes[header_bytes];
-
-private:
-    void name(const char* text)
-    {
-        std::memcpy(at, text, 4);
-        at += 4;
-    }
-
-    void number_16(std::uint16_t value)
-    {
-        store_big_16(at, value);
-        at += 2;
-    }
-
-    void number_32(std::uint32_t value)
-    {
-        store_big_32(at, value);
-        at += 4;
-    }
-
-    unsigned char* at;
-};
 
 /// Writes samples as the bytes that they have in the file.
 void store_samples(const short* samples, std::size_t count,
@@ -148,17 +63,18 @@ Written write_aifc(const KvoSound& sound, const char* name)
     const std::size_t bytes_a_sample = sample_bytes(sound);
     const std::uint64_t data_bytes = std::uint64_t{count} * bytes_a_sample;
     const std::unique_ptr<unsigned char[]> block(
-        new (std::nothrow) unsigned char[header_bytes + block_bytes + 1]);
-    if (!block || data_bytes + header_bytes > largest_form)
+        new (std::nothrow) unsigned char[aifc_header_bytes + block_bytes + 1]);
+    if (!block || data_bytes > most_aifc_bytes)
         return Written::NotKept;
     zt_platform::NewFile file(name);
     if (!file.is_open())
         return Written::NotOpened;
 
     // The header goes out with the first samples, a pad with the last.
-    const Header header(sound, static_cast<std::uint32_t>(data_bytes));
-    std::memcpy(block.get(), header.bytes, header_bytes);
-    std::size_t filled = header_bytes;
+    store_aifc_header(block.get(),
+                      {static_cast<int>(samples_in_frame(sound)), sound.rate,
+                       bytes_a_sample, static_cast<std::uint32_t>(data_bytes)});
+    std::size_t filled = aifc_header_bytes;
     std::size_t done = 0;
     do {
         const std::size_t here =
