@@ -122,6 +122,7 @@ TEST(KvoPrefsMemory, WithoutMemorySettingsStayAsTheyAre)
 TEST(KvoPrefsMemory, AVariableIsMadeWholeOrNotAtAll)
 {
     const std::string name(300, 'n');
+    const int before = KvoPrefs::Table().count;
     bool failed = true;
     for (long spared = 0; failed; ++spared) {
         ASSERT_LT(spared, 100);
@@ -132,6 +133,7 @@ TEST(KvoPrefsMemory, AVariableIsMadeWholeOrNotAtAll)
         }
         auto* made = KvoPrefs::Table().Search(name.c_str());
         EXPECT_TRUE(failed || made);
+        EXPECT_EQ(KvoPrefs::Table().count, made ? before + 1 : before);
         EXPECT_TRUE(!made || static_cast<KvoNamedObject*>(made)->name == name);
     }
     EXPECT_STREQ(KvoPrefs::Variable(name.c_str(), ""), "value");
