@@ -1,6 +1,7 @@
 #include "platform/video_lanes.h"
 
 #include "platform/x86/video_lanes_avx2.h"
+#include "platform/x86/video_lanes_avx512.h"
 
 namespace zt_platform {
 
@@ -80,6 +81,8 @@ const VideoLanes& VideoLanes::plain()
 
 const VideoLanes& VideoLanes::fastest()
 {
+    if (const VideoLanes* widest = avx512_video_lanes())
+        return *widest;
     const VideoLanes* wide = avx2_video_lanes();
     return wide ? *wide : plain_lanes;
 }

@@ -10,6 +10,8 @@
 #include "image/literal_frame.h"
 #include "image/pictures.h"
 #include "platform/video_lanes.h"
+#include "platform/x86/video_lanes_avx2.h"
+#include "platform/x86/video_lanes_avx512.h"
 
 namespace {
 
@@ -72,7 +74,7 @@ PixelList Made(const Value& value)
     return pixels;
 }
 
-/// Each comparison is made with the plain lanes and with the fastest.
+/// Each comparison is made with every kind of lanes that this processor has.
 class VideoFrameTest : public testing::TestWithParam<const VideoLanes*>
 {
 protected:
@@ -82,10 +84,19 @@ protected:
     std::mt19937 random{73};
 };
 
-INSTANTIATE_TEST_SUITE_P(Plain, VideoFrameTest,
-                         testing::Values(&VideoLanes::plain()));
-INSTANTIATE_TEST_SUITE_P(Fastest, VideoFrameTest,
-                         testing::Values(&VideoLanes::fastest()));
+std::vector<const VideoLanes*> AllLanes()
+{
+    std::vector<const VideoLanes*> all = {&VideoLanes::plain()};
+    for (const VideoLanes* lanes :
+         {zt_platform::avx2_video_lanes(), zt_platform::avx512_video_lanes()})
+        if (lanes)
+            all.push_back(lanes);
+    return all;
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Lanes, VideoFrameTest, testing::ValuesIn(AllLanes()),
+    [](const auto& about) { return std::string(about.param->name()); });
 
 TEST_P(VideoFrameTest, RandomPicturesAgreeWithALiteralConversion)
 {

@@ -15,15 +15,14 @@ namespace framestore {
 
 namespace {
 
-constexpr int raw_video = 1;     ///< The library's number of that kind.
-constexpr int number_digits = 6; ///< At least, so that names sort.
+constexpr int raw_video = 1; ///< The library's number of that kind.
 
+/// Gives the path of a frame without its extension; its number has at least
+/// six digits, so that names sort.
 std::string stem_of(const std::string& directory, int number)
 {
-    std::string digits = std::to_string(number);
-    const std::size_t sign = number < 0 ? 1 : 0;
-    if (digits.size() - sign < number_digits)
-        digits.insert(sign, number_digits - (digits.size() - sign), '0');
+    char digits[16];
+    std::snprintf(digits, sizeof digits, number < 0 ? "%07d" : "%06d", number);
     return directory + "/frame." + digits;
 }
 
