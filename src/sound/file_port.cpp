@@ -43,8 +43,10 @@ void FilePort::use_files(const char* played_to, const char* recorded_from)
 
 void FilePort::settle()
 {
-    while (thread.runs() && phase == Phase::Finishing)
+    while (thread.runs() && !is_released && phase == Phase::Finishing)
         std::this_thread::sleep_for(between_looks);
+    if (is_released)
+        thread.join();
     if (has_failed.exchange(false))
         ZtError("Failed to write audio file [%s].\n", output);
 }

@@ -98,10 +98,10 @@ void begin_call()
         return;
     if (!AudioDevice::is_installed())
         choose_device();
-    AudioDevice::current().settle();
     let_go_of_plays();
     let_go_of_drags();
     let_go_of_recordings();
+    AudioDevice::current().settle();
 }
 
 zt_platform::AudioPortConfig port_for(const KvoSound& sound)

@@ -15,6 +15,10 @@ namespace {
 
 constexpr std::uint64_t millisecond = 1000000;
 
+// In seconds. Less would break on a busy machine, and sounds that are fed every
+// 100 ms gain nothing by it.
+constexpr double least_latency = 0.1;
+
 // By the real clock, whatever clock the process goes by: so does the device.
 std::uint64_t real_nanoseconds()
 {
@@ -125,8 +129,9 @@ bool PaDevice::try_stream(PaPort& port, int channels, double rate)
     wanted.channelCount = std::min(channels, plays ? about->maxOutputChannels
                                                    : about->maxInputChannels);
     wanted.sampleFormat = paInt16;
-    wanted.suggestedLatency = plays ? about->defaultHighOutputLatency
-                                    : about->defaultHighInputLatency;
+    wanted.suggestedLatency =
+        std::max(least_latency, plays ? about->defaultHighOutputLatency
+                                      : about->defaultHighInputLatency);
     const double stream_rate = rate > 0 ? rate : about->defaultSampleRate;
     const StandardErrorAway away;
     if (wanted.channelCount < 1 ||
