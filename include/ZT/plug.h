@@ -39,7 +39,7 @@ ZT_API void KvoInitializePlugin(ZtPlugCatalog* catalog);
 ///     }
 #define ZT_PLUGIN(id, catalog)                                                 \
     extern "C" {                                                               \
-    ZT_API const char* KvoPluginIDString = id;                                 \
+    ZT_API const char* KvoPluginIDString = (id);                               \
     }                                                                          \
     extern "C" ZT_API void KvoInitializePlugin(ZtPlugCatalog* catalog)
 

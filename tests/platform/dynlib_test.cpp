@@ -159,7 +159,7 @@ TEST(ObjectExtent, IsCutWhenTheSegmentTableEndsBehindTheFile)
 
 TEST(ObjectExtent, IsCutWhenTheHeaderIs)
 {
-    for (std::size_t bytes : {4, 5, 15, 16, 51})
+    for (std::size_t bytes : {4U, 5U, 15U, 16U, 51U})
         ExpectForAllKinds(ObjectExtent::Cut, [bytes](Object& object) {
             object.bytes.resize(bytes);
         });

@@ -56,7 +56,7 @@ std::string write_new(const std::filesystem::path& path,
     std::filesystem::create_directories(path.parent_path(), fault);
     if (fault)
         return fault.message();
-    const std::string why = WhyNotWritable(path.string());
+    std::string why = WhyNotWritable(path.string());
     if (!why.empty())
         return why;
     std::ofstream out(path, std::ios::binary);
