@@ -42,6 +42,6 @@ bool PictureRecognizer::add_result(std::unique_ptr<RecognizerResult> result)
     results.PushTail(object);
     if (results.count == before)
         return false;
-    result.release();
+    static_cast<void>(result.release());
     return true;
 }

@@ -152,7 +152,7 @@ private:
 int Searcher::length(int thumbnail_length, int size)
 {
     const double scale = std::exp2(static_cast<double>(size) / steps_an_octave);
-    return std::max(1, static_cast<int>(thumbnail_length * scale + 0.5));
+    return std::max(1, static_cast<int>(std::lround(thumbnail_length * scale)));
 }
 
 bool Searcher::fits(int size) const

@@ -200,6 +200,31 @@ TEST_F(EdgeRecognizerTest, WithoutMemoryForAFrameItSaysSo)
     EXPECT_EQ(recognizer.Recognize(frame), 3);
 }
 
+TEST_F(EdgeRecognizerTest, ARunThatFailsHalfWayHasNoResults)
+{
+    recognizer.Configure();
+    ZtImageSGI frame = ImageOf(scene);
+    ErrorTrap reports;
+    int failures = 0;
+    for (long spared = 1;; spared += spared / 4 + 1) {
+        reports.Clear();
+        bool failed = false;
+        int count = 0;
+        {
+            FailingMemory memory(spared, 1);
+            count = recognizer.Recognize(frame);
+            failed = FailingMemory::Failed();
+        }
+        EXPECT_EQ(count, failed ? 0 : 3) << spared;
+        EXPECT_EQ(recognizer.results.count, count);
+        EXPECT_EQ(reports.reports.size(), failed ? 1U : 0U) << spared;
+        if (!failed)
+            break;
+        ++failures;
+    }
+    EXPECT_GT(failures, 20);
+}
+
 TEST_F(EdgeRecognizerTest, WithoutMemoryForATargetItSaysSo)
 {
     ErrorTrap reports;

@@ -106,6 +106,27 @@ TEST(edge_search, FindsAThumbnailThatIsTheWholeFrame)
     EXPECT_NEAR(hits[0].score, 1.0, 1e-9);
 }
 
+TEST(edge_search, FindsAThumbnailThatFillsFramesOfAnySize)
+{
+    // Of many of these sizes a reduction drops a column or a row that the
+    // reduced thumbnail still has.
+    Grey thumbnail = Thumbnail(3);
+    for (auto [width, height] : {std::pair{80, 61},
+                                 {95, 72},
+                                 {113, 86},
+                                 {135, 102},
+                                 {190, 144},
+                                 {226, 171},
+                                 {269, 203},
+                                 {320, 242}}) {
+        std::vector<Hit> hits =
+            Found(Scaled(thumbnail, width, height), thumbnail);
+
+        ASSERT_GE(hits.size(), 1U) << width;
+        ExpectAt(hits[0], 0, 0, width, height, 1);
+    }
+}
+
 TEST(edge_search, FindsAThumbnailUnderNoise)
 {
     Grey thumbnail = Thumbnail(4);
@@ -170,6 +191,29 @@ TEST(edge_search, FindsAThumbnailOfAnySizeFromHalfToTwice)
     }
 }
 
+TEST(edge_search, FindsHardEdgesOfAnySize)
+{
+    // Squares of 8 pixels, which resemble themselves only nearly in place.
+    Grey thumbnail = Scaled(Noise(20, 15, 30), 160, 121);
+    for (auto [width, height] : {std::pair{87, 66},
+                                 {95, 72},
+                                 {113, 86},
+                                 {132, 100},
+                                 {147, 111},
+                                 {174, 132},
+                                 {197, 149},
+                                 {226, 171},
+                                 {290, 219}}) {
+        Grey frame = Background(450, 350);
+        Paste(frame, Scaled(thumbnail, width, height), 83, 39);
+
+        std::vector<Hit> hits = Found(frame, thumbnail);
+
+        ASSERT_EQ(hits.size(), 1U) << width;
+        ExpectAt(hits[0], 83, 39, width, height, 4);
+    }
+}
+
 TEST(edge_search, FindsThreeCopiesOfThreeSizesTheBestFirst)
 {
     Grey thumbnail = Thumbnail(7);
@@ -217,6 +261,32 @@ TEST(edge_search, OfCopiesThatOverlapMuchOnlyTheBestIsGiven)
         EXPECT_FALSE(std::abs(hits[i].x - 140) < 40 &&
                      std::abs(hits[i].y - 80) < 30 && hits[i].width > 140 &&
                      hits[i].width < 180);
+}
+
+/// A thumbnail that repeats itself after so many columns.
+Grey Repeating(int columns)
+{
+    Grey thumbnail = Plain(160, 121, 0);
+    Grey part = Blobs(columns, 121, 31);
+    for (int x = 0; x < 160; x += columns)
+        Paste(thumbnail, part, x, 0);
+    return thumbnail;
+}
+
+TEST(edge_search, OverlapsOfMoreThanThreeTenthsCountAsOne)
+{
+    Grey close = Repeating(70);
+    Grey apart = Repeating(100);
+    Grey close_frame = Background(420, 300);
+    Grey apart_frame = Background(420, 300);
+    for (int i = 0; i < 2; ++i) {
+        Paste(close_frame, close, 60 + 70 * i, 90);
+        Paste(apart_frame, apart, 60 + 100 * i, 90);
+    }
+
+    // 90 of 230 columns are shared, and 60 of 260.
+    EXPECT_EQ(Found(close_frame, close, 0.98).size(), 1U);
+    EXPECT_EQ(Found(apart_frame, apart, 0.98).size(), 2U);
 }
 
 TEST(edge_search, FindsFineGrainedThumbnails)
