@@ -33,9 +33,12 @@ class Consumer:
         self.source = self.tree / "tests/consumer"
 
     def run(self, *command, **environment):
-        return subprocess.run(command, check=True, text=True,
+        done = subprocess.run(command, check=False, text=True,
                               env=dict(os.environ, **environment),
-                              stdout=subprocess.PIPE).stdout
+                              stdout=subprocess.PIPE)
+        if done.returncode != 0:
+            sys.exit(f"{done.stdout}\n{command}: code {done.returncode}")
+        return done.stdout
 
     def expect(self, program, standard, libraries=""):
         """Runs a program, which finds the library by itself or in a folder."""

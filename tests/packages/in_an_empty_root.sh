@@ -34,16 +34,13 @@ for tool in $(dpkg -L zt-util2-tools | sed -n 's|^/usr/bin/||p'); do
     "$tool" --version
 done
 
-# Nothing of the checkout but the tests: what is used is what was installed.
+# Of the checkout only the tests: what is used is what was installed.
 mkdir /work /work/build
 cp -a /src/tests /work/tests
 for way in find_package pkg_config; do
     python3 /work/tests/consumer/consumer_test.py $way /work /work/build \
         c++ "$libdir" --installed
 done
-python3 /src/tests/consumer/consumer_test.py add_subdirectory /src /work/build \
-    c++ "$libdir"
-rm -rf /src/src /src/include /src/tools
 
 say "a plug-in"
 cd /work
@@ -77,4 +74,9 @@ say "taking them off again"
 dpkg --purge $(dpkg-query -W -f '${Package}\n' '*zt-util2*') >>$log
 left=$(find /usr -name '*zt_util2*' -o -name '*ztsh*' -o -name '*zt-util2*')
 [ -z "$left" ] || { echo "left behind: $left"; exit 1; }
+
+say "a host that builds the library itself"
+/src/scripts/setup
+python3 /src/tests/consumer/consumer_test.py add_subdirectory /src /work/build \
+    c++ "$libdir"
 say "all well"
