@@ -7,7 +7,7 @@
 int main()
 {
     constexpr int film = 24;
-    constexpr int video = 25;
+    constexpr int video = 30;
     KvoTime in(0, 1, 0, 12, film);
     KvoTime out("0:1:30:20", film);
     KvoTime length = out - in;

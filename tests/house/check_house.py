@@ -65,11 +65,22 @@ def check_program_in_readme(root):
         yield "README.md: the program shown is not examples/hello.cpp"
 
 
+def check_pages_and_examples_are_listed(root):
+    for listing, patterns in (("docs/README.md", ("*.md",)),
+                              ("examples/README.md", ("*.cpp", "*.zt"))):
+        text = (root / listing).read_text(encoding="utf-8")
+        for pattern in patterns:
+            for path in sorted((root / listing).parent.glob(pattern)):
+                if path.name != "README.md" and f"({path.name})" not in text:
+                    yield f"{listing}: does not list {path.name}"
+
+
 def main():
     root = pathlib.Path(sys.argv[1])
     faults = [fault
               for check in (check_sizes, check_guards, check_rooms,
-                            check_paths_in_readme, check_program_in_readme)
+                            check_paths_in_readme, check_program_in_readme,
+                            check_pages_and_examples_are_listed)
               for fault in check(root)]
     print("\n".join(faults) or "house: all well")
     return 1 if faults else 0

@@ -64,7 +64,7 @@ done
 for case in /work/tests/shell/cases/example_*.case \
             /work/tests/shell/cases/realtime_countdown.case; do
     python3 /work/tests/shell/run_case.py /usr/bin/ztsh "$documents" "$case" \
-        >/work/said || { echo "$case:"; cat /work/said; exit 1; }
+        edge="$(pkg-config --variable=plugindir zt_util2)" >/work/said || { echo "$case:"; cat /work/said; exit 1; }
 done
 cd /work
 ztsh "$documents/examples/tour.zt" >/dev/null 2>/work/said
