@@ -58,7 +58,7 @@ void VideoLanes::mix(const std::uint32_t* pixels, unsigned char* groups,
         const Channels first(pixels[2 * pair]);
         const Channels second(pixels[2 * pair + 1]);
         unsigned char* group = groups + 4 * pair;
-        for (int i = 0; i < 2; ++i) {
+        for (std::size_t i = 0; i < 2; ++i) {
             const VideoMix::Chroma& chroma = video.chroma[i];
             const int before = now.second[i];
             now.second[i] = second.weighed(chroma.second);

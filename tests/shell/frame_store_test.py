@@ -144,6 +144,24 @@ class FrameStoreTest(unittest.TestCase):
                                          for i in range(1, 13)))
         self.assertEqual(len(self.received()), 12)
 
+    def test_the_example(self):
+        done = subprocess.run(
+            [SHELL, "--ddr-timeout", "20", TREE / "examples/frame_store.zt"],
+            cwd=self.directory, text=True, capture_output=True,
+            timeout=SECONDS,
+            env=dict(os.environ, QUARN_DDR_HOST=self.start_server()))
+        self.assertEqual((done.returncode, done.stdout, done.stderr),
+                         (0, "", "".join(f"Writing to ddr frame {i}\n"
+                                         for i in range(1, 11))))
+        self.assertEqual(len(self.received()), 10)
+        # Coarse blocks first, the picture itself last.
+        frames = [f.read_bytes() for f in sorted(self.frames.iterdir())]
+        self.assertEqual(len(set(frames)), 10)
+        self.assertLess(len(set(frames[0][i:i + 4] for i in
+                                range(0, 699840, 4))),
+                        len(set(frames[9][i:i + 4] for i in
+                                range(0, 699840, 4))))
+
     def test_a_frame_that_is_refused_is_the_last(self):
         seen = []
 

@@ -62,6 +62,7 @@ void Wait(std::vector<Watched>& watched,
           const std::optional<std::chrono::steady_clock::time_point>& deadline)
 {
     std::vector<pollfd> polled;
+    polled.reserve(watched.size());
     for (const Watched& one : watched)
         polled.push_back({one.descriptor, POLLIN, 0});
     timespec limit = {};
