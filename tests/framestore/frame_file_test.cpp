@@ -184,7 +184,7 @@ TEST_F(FrameFileTest, ADiskWithoutRoomKeepsTheOlderFrame)
     std::signal(SIGXFSZ, SIG_IGN);
     struct rlimit former = {};
     getrlimit(RLIMIT_FSIZE, &former);
-    for (rlim_t room : {0, 1000, 699839}) {
+    for (rlim_t room : {0ul, 1000ul, 699839ul}) {
         struct rlimit small = {room, former.rlim_max};
         setrlimit(RLIMIT_FSIZE, &small);
         std::string why = Write(7);

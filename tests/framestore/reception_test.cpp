@@ -67,7 +67,7 @@ TEST_F(ReceptionTest, PiecesMayBeOfAnySize)
 {
     const std::string message = Message("host", seven);
     std::mt19937 random(5333);
-    for (std::size_t most : {1, 3, 65, 70, 5000, 200000}) {
+    for (std::size_t most : {1ul, 3ul, 65ul, 70ul, 5000ul, 200000ul}) {
         Reception reception(storage);
         std::size_t at = 0;
         while (at < message.size()) {
@@ -101,7 +101,7 @@ TEST_F(ReceptionTest, WhatComesBehindTheFrameIsDropped)
 TEST_F(ReceptionTest, AnIncompleteMessageLeavesNothing)
 {
     const std::string message = Message("host", seven);
-    for (std::size_t count : {0, 1, 64, 67, 68, 69, 699907}) {
+    for (std::size_t count : {0ul, 1ul, 64ul, 67ul, 68ul, 69ul, 699907ul}) {
         Reception reception(storage);
         reception.Take(message.data(), count);
         EXPECT_FALSE(reception.Complete());

@@ -313,7 +313,7 @@ TEST_F(FrameStore, ShortAndInterruptedTransfersAreGoneOnWith)
 // A server that has heard enough may answer and close.
 TEST_F(FrameStore, TheAnswerCountsAlsoWhenNotAllCouldBeSent)
 {
-    for (std::size_t ends : {0, 64, 68, 100000}) {
+    for (std::size_t ends : {0ul, 64ul, 68ul, 100000ul}) {
         sockets.sent.clear();
         sockets.send_ends = ends;
         sockets.answered = 0;
