@@ -133,11 +133,19 @@ public:
     /// at the timer's end or behind it is not played. The sound stops when the
     /// timer stops or ends, and is played once: a restarted timer is silent.
     ///
-    /// Requires: a sound and a timer; the sound stays as it is until it was
-    ///           played or the timer is gone.
+    /// Requires: a sound and a timer; the sound stays as it is for as long as
+    ///           `Uses` tells.
     /// Reports:  inside the beat, an error "Failed to open an audio port for
     ///           writing.\n"; then nothing is played.
     static void Play(KvoSound* sound, ZtTimer* timer, KvoTime time);
+
+    /// Tells whether a sound that follows a timer waits for its time or is
+    /// being played; not any more once all of it was.
+    static int Playing(const KvoSound* sound);
+
+    /// Tells whether something that follows a timer may still look at a sound,
+    /// which must stay until then.
+    static int Uses(const KvoSound* sound);
 
     /// Scrubs a mono sound: every `interval` of the running timer the part
     /// between the previous and the present `*position` is played, backward if

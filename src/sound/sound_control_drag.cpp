@@ -115,6 +115,15 @@ void zt_sound::let_go_of_drags()
     });
 }
 
+bool zt_sound::drag_uses(const KvoSound* sound)
+{
+    bool uses = false;
+    drags.for_each([&](const DragRecord& record) {
+        uses = uses || record.sound == sound;
+    });
+    return uses;
+}
+
 void ZtSoundControl::PlayDrag(KvoSound* sound, ZtTimer* timer, long interval,
                               float* position)
 {

@@ -242,6 +242,34 @@ void zt_sound::let_go_of_plays()
     });
 }
 
+bool zt_sound::play_uses(const KvoSound* sound)
+{
+    bool uses = false;
+    plays.for_each([&](const PlayRecord& record) {
+        uses = uses || record.sound == sound;
+    });
+    return uses;
+}
+
+int ZtSoundControl::Playing(const KvoSound* sound)
+{
+    zt_sound::begin_call();
+    const zt_time::BeatHeld held;
+    bool playing = false;
+    plays.for_each([&](const PlayRecord& record) {
+        playing = playing ||
+                  (record.sound == sound && (record.open || !record.posted));
+    });
+    return playing;
+}
+
+int ZtSoundControl::Uses(const KvoSound* sound)
+{
+    zt_sound::begin_call();
+    const zt_time::BeatHeld held;
+    return zt_sound::play_uses(sound) || zt_sound::drag_uses(sound);
+}
+
 void ZtSoundControl::Play(KvoSound* sound, ZtTimer* timer, KvoTime time)
 {
     zt_sound::begin_call();

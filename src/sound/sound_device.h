@@ -46,6 +46,10 @@ struct WatchedTimer
     int id = 0;
 };
 
+/// Tell whether a playback or a drag looks at a sound.
+bool play_uses(const KvoSound* sound);
+bool drag_uses(const KvoSound* sound);
+
 /// What `begin_call` lets go of.
 void let_go_of_plays();
 void let_go_of_drags();

@@ -58,6 +58,8 @@ TEST_F(DragTest, OpensAPortAtOnceAndPostsItsCallbacks)
 
     Control::PlayDrag(&sound, &timer, 40, &position);
     Beats(1);
+    EXPECT_TRUE(Control::Uses(&sound));
+    EXPECT_FALSE(Control::Playing(&sound));
 
     ASSERT_EQ(device.opens.size(), 1U);
     EXPECT_EQ(device.opens[0].channels, 1);
@@ -251,7 +253,7 @@ TEST_F(DragTest, DestroyingTheTimerLetsGoOfTheDragAtTheNextCall)
     }
     EXPECT_EQ(device.open_ports, 1);
 
-    Control::OutputRate();
+    EXPECT_FALSE(Control::Uses(&sound));
 
     EXPECT_EQ(device.ready_ports, 0);
 }

@@ -626,3 +626,26 @@ TEST_F(PlayTimer, NullsAndEmptySoundsPlayNothing)
     EXPECT_EQ(device.open_ports, 0);
     EXPECT_TRUE(device.blocks.empty());
 }
+
+TEST_F(PlayTimer, TellsHowLongASoundIsPlayedAndUsed)
+{
+    KvoSound sound = MonoSound(Ramp(8000), 8000);
+    KvoSound other = MonoSound(Ramp(10));
+    EXPECT_FALSE(Control::Playing(&sound));
+    EXPECT_FALSE(Control::Uses(&sound));
+    {
+        ZtTimer timer(KvoTime(), ten_seconds);
+        Control::Play(&sound, &timer, one_second);
+        EXPECT_TRUE(Control::Playing(&sound)); // it waits for its time
+        Start(timer);
+        RunFor(1.5);
+        EXPECT_TRUE(Control::Playing(&sound));
+        EXPECT_FALSE(Control::Playing(&other));
+        RunFor(1);
+        EXPECT_FALSE(Control::Playing(&sound));
+        EXPECT_TRUE(Control::Uses(&sound)); // it can be played once more
+        EXPECT_FALSE(Control::Uses(&other));
+    }
+
+    EXPECT_FALSE(Control::Uses(&sound));
+}

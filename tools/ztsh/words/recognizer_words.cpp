@@ -7,9 +7,7 @@
 
 #include <ZT/error.h>
 
-#include <charconv>
 #include <cmath>
-#include <cstring>
 #include <iostream>
 #include <utility>
 
@@ -57,18 +55,6 @@ const std::vector<Word> words = {
 const char* name_of(int selector)
 {
     return words[static_cast<std::size_t>(selector)].name;
-}
-
-/// Reads a number from 0 to 1.
-bool read_threshold(const char* text, double& threshold)
-{
-    const char* end = text + std::strlen(text);
-    double read = 0.0;
-    auto [stop, fault] = std::from_chars(text, end, read);
-    if (fault != std::errc() || stop != end || !(read >= 0.0 && read <= 1.0))
-        return false;
-    threshold = read;
-    return true;
 }
 
 /// Gives a score with three decimals, whatever the locale.
@@ -220,7 +206,7 @@ void RecognizerWords::recognize(const KvoStatement& statement)
         return;
     PictureRecognizer& recognizer = held->Get();
     const char* threshold = statement.ArgText(3);
-    if (threshold && !read_threshold(threshold, recognizer.threshold)) {
+    if (threshold && !ReadReal(threshold, 0, 1, recognizer.threshold)) {
         ZtError("%s: expected a threshold of 0 to 1, not %s\n",
                 name_of(Recognize), threshold);
         return;

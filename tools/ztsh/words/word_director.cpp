@@ -55,15 +55,31 @@ void WordDirector::Expected(int selector) const
             *word.arguments ? " " : "", word.arguments);
 }
 
-bool ReadNumber(const char* text, long least, long most, long& number)
+namespace {
+
+template <class Number>
+bool read_whole(const char* text, Number least, Number most, Number& number)
 {
-    long read = 0;
+    Number read = 0;
     const char* end = text + std::strlen(text);
     auto [stop, fault] = std::from_chars(text, end, read);
-    if (fault != std::errc() || stop != end || read < least || read > most)
+    // In this form not-a-number is out of range.
+    if (fault != std::errc() || stop != end || !(read >= least && read <= most))
         return false;
     number = read;
     return true;
+}
+
+} // namespace
+
+bool ReadNumber(const char* text, long least, long most, long& number)
+{
+    return read_whole(text, least, most, number);
+}
+
+bool ReadReal(const char* text, double least, double most, double& number)
+{
+    return read_whole(text, least, most, number);
 }
 
 } // namespace ztsh

@@ -71,6 +71,9 @@ private:
 ///          outside `least` to `most`.
 bool ReadNumber(const char* text, long least, long most, long& number);
 
+/// Reads a number with or without a fraction likewise.
+bool ReadReal(const char* text, double least, double most, double& number);
+
 } // namespace ztsh
 
 #endif
