@@ -80,18 +80,17 @@ void WriteZshCompletion(std::ostream& out, const Command& command)
     for (const Option& option : command.options) {
         std::string value;
         if (!option.value.empty()) {
-            value = ":" + option.value + ":";
+            value.append(":").append(option.value).append(":");
             if (option.files)
                 value += "_files";
             else if (!option.choices.empty())
                 value += "(" + joined(option.choices, " ") + ")";
         }
-        std::string help = escaped(option.help, "\\[]:");
         std::string others =
             option.repeats ? "*" : "(" + joined(option.names, " ") + ")";
+        std::string rest = "[" + escaped(option.help, "\\[]:") + "]" + value;
         for (const std::string& name : option.names)
-            out << " \\\n    "
-                << quoted(others + name + "[" + help + "]" + value);
+            out << " \\\n    " << quoted(joined({others, name, rest}, ""));
     }
     if (!command.words.value.empty())
         out << " \\\n    "
