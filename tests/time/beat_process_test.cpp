@@ -238,6 +238,62 @@ TEST_F(RealBeat, GoesOnAfterAJumpOutOfACallbackWhenItIsStartedAgain)
     EXPECT_EQ(ZtTimerBeat::blocked_count, 0);
 }
 
+TEST_F(RealBeat, AJumpOutOfTheWalkLeavesNoDangerBehindWhenItIsStartedAgain)
+{
+    static volatile bool jumps;
+    jumps = true;
+    WaitForCalls(1);
+    if (setjmp(leave) == 0) {
+        timer.post_trigger(
+            [](ZtTimer*, void*) {
+                if (!jumps)
+                    return;
+                jumps = false;
+                std::longjmp(leave, 1);
+            },
+            nullptr, KvoTime());
+        while (true)
+            Rest();
+    }
+
+    ZtTimerBeat::start();
+    WaitForCalls(calls + 5);
+
+    EXPECT_EQ(ZtTimerBeat::danger, 0);
+}
+
+TEST_F(RealBeat, AfterAJumpOutOfACallbackRequestsHoldTheAlarmBack)
+{
+    static volatile bool jumps;
+    static volatile bool held;
+    jumps = true;
+    held = false;
+    WaitForCalls(1);
+    timer.post_stop(
+        [](ZtTimer*, void*) {
+            sigset_t mask;
+            pthread_sigmask(SIG_SETMASK, nullptr, &mask);
+            held = sigismember(&mask, SIGALRM) == 1;
+            if (!jumps)
+                return;
+            jumps = false;
+            std::longjmp(leave, 1);
+        },
+        nullptr);
+    if (setjmp(leave) == 0) {
+        timer.stop();
+        while (true)
+            Rest();
+    }
+    ZtTimerBeat::start();
+    held = false;
+
+    ZtTimerBeat::start_op(&timer);
+    ZtTimerBeat::stop_op(&timer);
+
+    EXPECT_TRUE(held);
+}
+
 TEST_F(RealBeat, AChildHasNoBeatUntilItStartsItsOwn)
 {
     const pid_t child = fork();
