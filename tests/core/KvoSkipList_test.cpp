@@ -299,6 +299,8 @@ TEST(KvoSkipList, HeaderNeverYieldsAnObject)
     EXPECT_EQ(tens.list.SearchAlmost(&five), nullptr);
     tens.list.Clear();
     EXPECT_EQ(tens.list.Tail(), nullptr);
+    tens.list[&five] = &other;
+    EXPECT_EQ(tens.list.Tail(), nullptr);
 }
 
 TEST(KvoSkipList, ConstIndexingMovesTheCursorToo)

@@ -328,6 +328,8 @@ TEST(ZtSkipList, HeaderNeverYieldsAnItem)
     tens.list[&five] = &other;
     tens.list.Clear();
     EXPECT_EQ(tens.list.Tail(), nullptr);
+    tens.list[&five] = &other;
+    EXPECT_EQ(tens.list.Tail(), nullptr);
 }
 
 TEST(ZtSkipList, ConstIndexingMovesTheCursorToo)

@@ -129,6 +129,19 @@ TEST(OnSignal, TheSameHandlerHookedTwiceRunsTwice)
     EXPECT_EQ(calls, "aa");
 }
 
+TEST(OnSignal, ANullHandlerIsHookedAndDoesNothing)
+{
+    calls.clear();
+    const int signal = real_time_signal(13);
+    OnSignal(signal, note, &a);
+    OnSignal(signal, nullptr, &b);
+
+    raise(signal);
+
+    EXPECT_EQ(calls, "a");
+    EXPECT_EQ(handler_of(signal), SIG_DFL);
+}
+
 TEST(OnSignal, AHookGetsItsSignalAndItsData)
 {
     calls.clear();

@@ -415,6 +415,19 @@ TEST(KvoTime, TimeIsDividedInSinglePrecision)
     EXPECT_EQ(time.Time(KvoTime::hours), 1000000000.0f / 21600000.0f);
 }
 
+TEST(KvoTime, LargeTickCountsAreRoundedBeforeTheyAreDivided)
+{
+    const auto time = [](std::int32_t ticks, KvoTime::Unit unit) {
+        return KvoTime::FromTicks(ticks).Time(unit);
+    };
+
+    // Divided first and rounded then, each would be a bit larger or smaller.
+    EXPECT_EQ(time(16777221, KvoTime::milliseconds), 2796203.25f);
+    EXPECT_EQ(time(16777217, KvoTime::seconds), 2796.20264f);
+    EXPECT_EQ(time(16777217, KvoTime::minutes), 46.6033783f);
+    EXPECT_EQ(time(16777217, KvoTime::hours), 0.776722968f);
+}
+
 TEST(KvoTime, SetTimeReplacesTheValue)
 {
     KvoTime time;

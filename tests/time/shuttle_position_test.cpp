@@ -233,6 +233,44 @@ TEST(ZtShuttle, ARangeOfNoLengthStaysWhereItStarts)
     }
 }
 
+TEST(ZtShuttle, ARangeOfNoLengthForgetsTheOneBefore)
+{
+    for (const auto state : {ZtShuttle::Play, ZtShuttle::Reverse}) {
+        RecordingShuttle shuttle;
+        shuttle.Mark(7, 7, 20);
+        shuttle.SetState(state, 0);
+        shuttle.SetState(ZtShuttle::Stopped, 0);
+        shuttle.Mark(7, 7, 7);
+        shuttle.SetState(state, 0);
+
+        EXPECT_EQ(shuttle.length, KvoTime::ZERO);
+        EXPECT_EQ(shuttle.After(1000), KvoTime(0, 0, 7, 0));
+        EXPECT_EQ(shuttle.state, state);
+    }
+}
+
+TEST(ZtShuttle, SpeedZeroHasARangeOfNoLength)
+{
+    RecordingShuttle shuttle;
+    shuttle.Mark(10, 15, 20);
+    shuttle.SetState(ZtShuttle::Play, 0);
+    shuttle.SetSpeed(0.0f, 0);
+    shuttle.SetState(ZtShuttle::Reverse, 0);
+
+    EXPECT_EQ(shuttle.length, KvoTime::ZERO);
+}
+
+TEST(ZtShuttle, APointBeyondOneDayIsWrappedWhenPlayed)
+{
+    RecordingShuttle shuttle;
+    shuttle.times[ZtShuttle::in_point] = KvoTime(25, 0, 0, 0);
+    shuttle.times[ZtShuttle::out_point] = KvoTime(26, 0, 0, 0);
+    shuttle.SetState(ZtShuttle::Play, 0);
+
+    EXPECT_EQ(shuttle.After(0), KvoTime(1, 0, 0, 0));
+    EXPECT_EQ(shuttle.After(3600), KvoTime(2, 0, 0, 0));
+}
+
 TEST(ZtShuttle, SpeedZeroJumpsToTheStartOfTheRangeAndStays)
 {
     RecordingShuttle shuttle;
