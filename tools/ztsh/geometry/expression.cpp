@@ -4,7 +4,6 @@
 
 #include <array>
 #include <charconv>
-#include <utility>
 
 namespace ztsh {
 
@@ -260,7 +259,7 @@ std::optional<Value> ExpressionReader::call(const Function& function)
         auto read = argument(function, static_cast<Argument>(*kind));
         if (!read)
             return std::nullopt;
-        given.push_back(std::move(*read));
+        given.push_back(*read);
     }
     std::optional<Value> result = function.call(given);
     if (!result)
