@@ -451,9 +451,21 @@ class ServerTest(unittest.TestCase):
             (1, "zt-framestore: cannot write to /no/such: its directory: No "
              "such file or directory\n"))
 
+    def test_a_lock_file_that_cannot_be_made(self):
+        for lock, why in ((self.directory / "no/lock",
+                           "its directory: No such file or directory"),
+                          (self.directory, "it is a directory")):
+            code, errors = self.refused("--lock", str(lock))
+            self.assertEqual(code, 1)
+            self.assertEqual(
+                errors, f"zt-framestore: cannot make the lock file {lock}: "
+                        f"{why}\n")
+
     def test_wrong_options(self):
         for arguments in (["--port", "65536"], ["--port", "x"],
                           ["--clients", "0"], ["--timeout", "0"],
+                          ["--timeout", "nan"], ["--timeout", "inf"],
+                          ["--directory", ""], ["--lock", ""],
                           ["--nothing"], ["word"]):
             code, errors = self.refused(*arguments)
             self.assertEqual(code, 2, arguments)

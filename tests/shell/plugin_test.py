@@ -216,6 +216,11 @@ class New(PluginTest):
         (self.dir / "file").write_text("")
         done = self.run_shell("plugin", "new", "Hello", "file/below")
         self.assertEqual(done.returncode, 4)
+        name = 300 * "a"
+        done = self.run_shell("plugin", "new", name)
+        self.assertEqual(done.returncode, 4)
+        self.assertEqual(done.stderr, f"ztsh: {name}/{name}.cpp: "
+                         "File name too long\n")
 
 
 class Words(PluginTest):
@@ -286,6 +291,17 @@ class Words(PluginTest):
              "Error: PluginHelp: ./Well.d.dir: it is a directory"] +
             2 * ["Error: PluginHelp: expected: PluginHelp NAME [EXTENSION] "
                  "[into VARIABLE]"])
+
+    def test_scores_that_cannot_be_are_told_as_the_nearest_that_can(self):
+        self.put("impossible_scores", kind="r")
+        done = self.run_shell(
+            "-c", "LoadPlugins .; Recognizer finder Impossible; "
+            "Canvas scene 8 8 808080; Store scene a.rgb; "
+            "Target finder it a.rgb; Recognize finder scene")
+        self.assertEqual((done.returncode, done.stderr), (0, ""))
+        self.assertEqual(
+            [line.split()[-1] for line in done.stdout.splitlines()],
+            ["0.000", "0.000", "1.000", "1.000"])
 
     def test_a_script_called_plugin_is_run_by_its_path(self):
         (self.dir / "plugin").write_text("Echo a script\n")

@@ -5,6 +5,7 @@
 #include "common/files.h"
 
 #include <exception>
+#include <filesystem>
 #include <iostream>
 
 namespace {
@@ -21,6 +22,22 @@ bool is_writable(const std::string& directory)
     return why.empty();
 }
 
+/// Says on standard error why the lock file can never be made. One that is
+/// there is somebody else's, and no fault.
+///
+/// Returns: whether it can.
+bool is_possible(const std::string& lock)
+{
+    std::error_code fault;
+    if (lock.empty() || std::filesystem::is_regular_file(lock, fault))
+        return true;
+    const std::string why = zt_tools::WhyNotWritable(lock);
+    if (!why.empty())
+        std::cerr << "zt-framestore: cannot make the lock file " << lock << ": "
+                  << why << "\n";
+    return why.empty();
+}
+
 } // namespace
 
 int main(int argc, char** argv)
@@ -29,7 +46,8 @@ int main(int argc, char** argv)
         const framestore::Options options = framestore::ReadOptions(argc, argv);
         if (options.finished)
             return options.code;
-        if (!is_writable(options.settings.storage.directory))
+        if (!is_writable(options.settings.storage.directory) ||
+            !is_possible(options.settings.lock))
             return framestore::ExitNoService;
         framestore::CatchSignals();
         framestore::Server server(options.settings, std::cout);

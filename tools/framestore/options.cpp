@@ -1,5 +1,6 @@
 #include "options.h"
 
+#include "common/number_option.h"
 #include "pages/pages.h"
 
 #include <iostream>
@@ -22,8 +23,18 @@ constexpr const char* footer =
     "\n"
     "Exit codes:\n"
     "  0      stopped by a signal\n"
-    "  1      cannot listen, or cannot write to DIR\n"
+    "  1      cannot listen, cannot write to DIR, or cannot make FILE\n"
     "  2      the command line is wrong";
+
+/// Checks that a name is one: the empty one would mean the root directory.
+CLI::Validator not_empty()
+{
+    return CLI::Validator(
+        [](const std::string& name) {
+            return std::string(name.empty() ? "the name is empty" : "");
+        },
+        "");
+}
 
 void add_options(CLI::App& app, Options& options)
 {
@@ -42,7 +53,8 @@ void add_options(CLI::App& app, Options& options)
         ->check(CLI::Range(0, last_port));
     app.add_option("--directory", settings.storage.directory,
                    "Where frames are written (default: here)")
-        ->option_text("DIR");
+        ->option_text("DIR")
+        ->check(not_empty());
     app.add_flag("--png", settings.storage.png,
                  "Also write each frame as a PNG file, its lines in order");
     app.add_flag("--interleave", settings.storage.interleaved,
@@ -51,7 +63,8 @@ void add_options(CLI::App& app, Options& options)
     app.add_option("--lock", settings.lock,
                    "A file that is there, to have clients wait, while as many "
                    "are connected as --clients says (default: none)")
-        ->option_text("FILE");
+        ->option_text("FILE")
+        ->check(not_empty());
     app.add_option("--clients", settings.most_clients,
                    "How many clients are served at a time; others are left "
                    "waiting (default: 16)")
@@ -61,7 +74,7 @@ void add_options(CLI::App& app, Options& options)
                    "How long a client may take for its frame, in seconds "
                    "(default: 60)")
         ->option_text("SECONDS")
-        ->check(CLI::Range(shortest_timeout, longest_timeout));
+        ->check(zt_tools::NumberFromTo(shortest_timeout, longest_timeout));
     zt_pages::AddPageOption(app, options.page);
 }
 

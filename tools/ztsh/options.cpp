@@ -1,5 +1,6 @@
 #include "options.h"
 
+#include "common/number_option.h"
 #include "exit_code.h"
 #include "pages/command.h"
 
@@ -76,7 +77,7 @@ void AddOptions(CLI::App& app, Options& options)
                    "Seconds that sending a frame to the frame store may take "
                    "(default: as long as it takes)")
         ->option_text("SECONDS")
-        ->check(CLI::Range(shortest_timeout, longest_timeout));
+        ->check(zt_tools::NumberFromTo(shortest_timeout, longest_timeout));
     zt_pages::AddPageOption(app, options.page);
 }
 

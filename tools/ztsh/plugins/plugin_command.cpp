@@ -77,8 +77,10 @@ int write_template(const Request& request)
     const PluginKind* kind =
         KindByName(request.kind.empty() ? "directive" : request.kind);
     const auto files = TemplateFiles(request.name, *kind);
+    // A path that cannot even be looked at is told when it is to be written.
+    std::error_code unknown;
     for (const TemplateFile& file : files)
-        if (std::filesystem::exists(directory / file.name)) {
+        if (std::filesystem::exists(directory / file.name, unknown)) {
             std::cerr << "ztsh: " << (directory / file.name).string()
                       << " is there already; nothing was written\n";
             return ExitReported;

@@ -7,6 +7,7 @@
 
 #include <ZT/error.h>
 
+#include <algorithm>
 #include <cmath>
 #include <iostream>
 #include <utility>
@@ -57,10 +58,12 @@ const char* name_of(int selector)
     return words[static_cast<std::size_t>(selector)].name;
 }
 
-/// Gives a score with three decimals, whatever the locale.
+/// Gives a score with three decimals, whatever the locale. What no score can
+/// be, for plug-ins are free to say anything, is the nearest that can.
 std::string score_text(double score)
 {
-    const long thousandths = std::lround(score * 1000);
+    const double possible = score >= 0 ? std::min(score, 1.0) : 0;
+    const long thousandths = std::lround(possible * 1000);
     std::string digits = std::to_string(thousandths % 1000);
     digits.insert(0, 3 - digits.size(), '0');
     return std::to_string(thousandths / 1000) + "." + digits;
