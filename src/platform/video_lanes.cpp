@@ -3,6 +3,8 @@
 #include "platform/x86/video_lanes_avx2.h"
 #include "platform/x86/video_lanes_avx512.h"
 
+#include <algorithm>
+
 namespace zt_platform {
 
 namespace {
@@ -42,6 +44,42 @@ unsigned char whole_part(int sum, std::uint32_t& fraction, int offset)
     return static_cast<unsigned char>((sum >> 16) + offset);
 }
 
+/// What the chromas of a pair add to each channel.
+struct ChromaSums
+{
+    ChromaSums(const unsigned char* group, const VideoColors& colors)
+    {
+        const int first = group[0] - colors.chroma_offset;
+        const int second = group[2] - colors.chroma_offset;
+        auto sum = [=](const VideoColors::Chromas& weights) {
+            return weights.first * first + weights.second * second;
+        };
+        red = sum(colors.red);
+        green = sum(colors.green);
+        blue = sum(colors.blue);
+    }
+
+    int red;
+    int green;
+    int blue;
+};
+
+std::uint32_t clamped_whole(int sum)
+{
+    return static_cast<std::uint32_t>(std::clamp(sum >> 16, 0, 0xFF));
+}
+
+std::uint32_t colored(int luma, const ChromaSums& chromas,
+                      const VideoColors& colors)
+{
+    const int grey = std::max(luma - colors.luma_offset, 0) * colors.luma;
+    const std::uint32_t red = clamped_whole(grey + chromas.red);
+    const std::uint32_t green = clamped_whole(grey + chromas.green);
+    const std::uint32_t blue = clamped_whole(grey + chromas.blue);
+    return colors.red_lowest ? red | green << 8 | blue << 16
+                             : red << 24 | green << 16 | blue << 8;
+}
+
 } // namespace
 
 const char* VideoLanes::name() const
@@ -72,6 +110,17 @@ void VideoLanes::mix(const std::uint32_t* pixels, unsigned char* groups,
             whole_part(second.weighed(video.luma), now.luma, video.luma_offset);
     }
     carry = now;
+}
+
+void VideoLanes::color(const unsigned char* groups, std::uint32_t* pixels,
+                       std::size_t pairs, const VideoColors& colors) const
+{
+    for (std::size_t pair = 0; pair < pairs; ++pair) {
+        const unsigned char* group = groups + 4 * pair;
+        const ChromaSums chromas(group, colors);
+        pixels[2 * pair] = colored(group[1], chromas, colors);
+        pixels[2 * pair + 1] = colored(group[3], chromas, colors);
+    }
 }
 
 const VideoLanes& VideoLanes::plain()

@@ -2,7 +2,8 @@
 #define ZT_PLATFORM_VIDEO_LANES_H
 
 /// \file
-/// Pixels mixed into luma and chroma, many at a time where the processor can.
+/// Pixels mixed into luma and chroma and made of them, many at a time where the
+/// processor can.
 ///
 /// The class itself does one pair of pixels after the other, on any processor,
 /// and is what everything else is held to: a derived class does the same in
@@ -55,6 +56,32 @@ struct VideoCarry
     int second[2] = {0, 0}; ///< What the last second pixel adds to a chroma.
 };
 
+/// How two lumas and two chromas become a pair of pixels.
+///
+/// Each channel of a pixel is a weighed sum of its luma and of the chromas of
+/// the pair, both less their offsets, a luma below its offset counting as the
+/// offset. Of the sum the whole part is taken, at most 255 and at least 0.
+///
+/// Units:    weights in 1/65536.
+/// Requires: offsets of 0 to 255; no sum that bytes can give leaves the range
+///           of 32 bits.
+struct VideoColors
+{
+    struct Chromas
+    {
+        int first;
+        int second;
+    };
+
+    int luma; ///< The weight of a luma in every channel.
+    int luma_offset;
+    Chromas red;
+    Chromas green;
+    Chromas blue;
+    int chroma_offset;
+    bool red_lowest; ///< Whether pixels are 0x00BBGGRR, else 0xRRGGBB00.
+};
+
 class VideoLanes
 {
 public:
@@ -68,6 +95,13 @@ public:
     virtual void mix(const std::uint32_t* pixels, unsigned char* groups,
                      std::size_t pairs, const VideoMix& video,
                      VideoCarry& carry) const;
+
+    /// Makes pairs of pixels of groups of four bytes: first chroma, luma,
+    /// second chroma, luma.
+    ///
+    /// Requires: 4 * `pairs` bytes and room for 2 * `pairs` pixels.
+    virtual void color(const unsigned char* groups, std::uint32_t* pixels,
+                       std::size_t pairs, const VideoColors& colors) const;
 
     /// Gives what is in use: the fastest that this processor can do, or what a
     /// test installed.

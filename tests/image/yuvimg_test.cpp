@@ -7,6 +7,7 @@
 #include "image/literal_codec.h"
 #include "image/pictures.h"
 #include "image/sgi_bytes.h"
+#include "platform/video_lanes.h"
 #include "support/CapturedStderr.h"
 #include "support/FaultyFiles.h"
 #include "support/InAChild.h"
@@ -14,6 +15,8 @@
 #include "support/ThrowingStderr.h"
 
 namespace {
+
+using zt_platform::VideoLanes;
 
 constexpr std::size_t frame_pixels = 720 * 486;
 constexpr std::size_t frame_bytes = 699840;
@@ -131,6 +134,35 @@ TEST(yuvimg, RandomFramesAgreeWithAPlainReader)
             frame += static_cast<char>(random());
 
         ASSERT_EQ(Read(frame), literal::ReadYuv(frame).pixels);
+    }
+}
+
+/// All pairs of chromas, each group with the lumas that `luma` gives for it.
+template <typename Luma>
+std::string FrameOfAllChromas(Luma luma)
+{
+    std::string frame;
+    for (int i = 0; frame.size() < frame_bytes; ++i)
+        frame += Bytes({i & 0xFF, luma(2 * i), i >> 8 & 0xFF, luma(2 * i + 1)});
+    return frame;
+}
+
+TEST(yuvimg, AllSamplesAgreeWithAPlainReader)
+{
+    std::mt19937 random(18);
+    const std::string frames[] = {
+        FrameOfAllChromas([](int i) { return i & 0x20000 ? 235 : 16; }),
+        FrameOfAllChromas([](int i) { return i & 0x20000 ? 60 : 180; }),
+        FrameOfAllChromas([&](int i) { return (i + (i >> 9)) & 0xFF; }),
+        FrameOfAllChromas(
+            [&](int) { return static_cast<int>(random() & 0xFF); })};
+    for (const std::string& frame : frames) {
+        const PixelList expected = literal::ReadYuv(frame).pixels;
+
+        VideoLanes::install(&VideoLanes::plain());
+        EXPECT_EQ(Read(frame), expected);
+        VideoLanes::install(nullptr);
+        EXPECT_EQ(Read(frame), expected);
     }
 }
 

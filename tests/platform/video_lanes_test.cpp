@@ -14,6 +14,7 @@ namespace {
 
 using zt_platform::ChannelWeights;
 using zt_platform::VideoCarry;
+using zt_platform::VideoColors;
 using zt_platform::VideoLanes;
 using zt_platform::VideoMix;
 using Words = std::vector<std::uint32_t>;
@@ -77,9 +78,10 @@ std::vector<const VideoLanes*> AllLanes()
     return all;
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    Lanes, VideoLanesTest, testing::ValuesIn(AllLanes()),
-    [](const auto& about) { return std::string(about.param->name()); });
+INSTANTIATE_TEST_SUITE_P(Lanes, VideoLanesTest, testing::ValuesIn(AllLanes()),
+                         [](const auto& about) {
+                             return std::string(about.param->name());
+                         });
 
 constexpr VideoMix nothing = {
     {0, 0, 0}, 0, {{{0, 0, 0}, {0, 0, 0}, 0}, {{0, 0, 0}, {0, 0, 0}, 0}}};
@@ -197,6 +199,117 @@ TEST_P(VideoLanesTest, AllGiveTheSameBitsAsThePlainOnes)
             ASSERT_EQ(carry.chroma[kind], plain_carry.chroma[kind]);
             ASSERT_EQ(carry.second[kind], plain_carry.second[kind]);
         }
+    }
+}
+
+Words Colored(const VideoLanes& lanes, const Bytes& groups,
+              const VideoColors& colors)
+{
+    Words pixels(groups.size() / 2 + 1, 0xA5A5A5A5);
+    lanes.color(groups.data(), pixels.data(), groups.size() / 4, colors);
+    EXPECT_EQ(pixels.back(), 0xA5A5A5A5);
+    pixels.pop_back();
+    return pixels;
+}
+
+constexpr VideoColors grey = {65536, 16, {0, 0}, {0, 0}, {0, 0}, 128, true};
+
+TEST_P(VideoLanesTest, ALumaBelowItsOffsetIsBlack)
+{
+    Words pixels = Colored(lanes, {0, 0, 0, 15, 0, 16, 0, 17}, grey);
+
+    EXPECT_EQ(pixels, (Words{0, 0, 0, 0x00010101}));
+}
+
+TEST_P(VideoLanesTest, EachChannelHasItsOwnShareOfTheChromas)
+{
+    VideoColors colors = grey;
+    colors.red = {65536, 0};
+    colors.green = {0, 2 * 65536};
+    colors.blue = {-65536, 65536};
+
+    Words red_lowest = Colored(lanes, {138, 116, 133, 117}, colors);
+    colors.red_lowest = false;
+    Words red_highest = Colored(lanes, {138, 116, 133, 117}, colors);
+
+    EXPECT_EQ(red_lowest, (Words{0x005F6E6E, 0x00606F6F}));
+    EXPECT_EQ(red_highest, (Words{0x6E6E5F00, 0x6F6F6000}));
+}
+
+TEST_P(VideoLanesTest, FractionsOfAChannelAreAddedBeforeTheyAreCut)
+{
+    VideoColors colors = grey;
+    colors.luma = 65536 / 4;
+    colors.red = {65536 / 4, 65536 / 2};
+    colors.green = {-65536 / 4, 0};
+
+    Words pixels = Colored(lanes, {129, 17, 129, 18}, colors);
+
+    EXPECT_EQ(pixels, (Words{0x00000001, 0x00000001}));
+}
+
+TEST_P(VideoLanesTest, AChannelIsClampedAtBothEnds)
+{
+    VideoColors colors = grey;
+    colors.red = {8421504, 0}; // The largest that fits.
+    colors.blue = {-8421504, 0};
+
+    Words above = Colored(lanes, {255, 255, 0, 16}, colors);
+    Words below = Colored(lanes, {0, 255, 0, 16}, colors);
+
+    EXPECT_EQ(above, (Words{0x0000EFFF, 0x000000FF}));
+    EXPECT_EQ(below, (Words{0x00FFEF00, 0x00FF0000}));
+}
+
+// How the plain ones do is compared with a reference in the tests of the
+// reader.
+TEST_P(VideoLanesTest, EverySampleOfVideoIsColoredAsByThePlainOnes)
+{
+    constexpr VideoColors video = {
+        76310, 16, {0, 104635}, {-25690, -53294}, {132278, 0}, 128, true};
+    for (int luma = 0; luma < 256; luma += 2) {
+        Bytes groups(4 * 65536);
+        for (std::size_t i = 0; i < 65536; ++i) {
+            groups[4 * i] = static_cast<unsigned char>(i);
+            groups[4 * i + 1] = static_cast<unsigned char>(luma);
+            groups[4 * i + 2] = static_cast<unsigned char>(i >> 8);
+            groups[4 * i + 3] = static_cast<unsigned char>(luma + 1);
+        }
+
+        ASSERT_EQ(Colored(lanes, groups, video),
+                  Colored(VideoLanes::plain(), groups, video))
+            << luma;
+    }
+}
+
+TEST_P(VideoLanesTest, AnyWeightsColorAsWithThePlainOnes)
+{
+    constexpr int most = 2500000; // Three of them, 255 times, fit 32 bits.
+    for (int i = 0; i < 2000; ++i) {
+        const auto chromas = [this] {
+            return VideoColors::Chromas{Between(-most, most),
+                                        Between(-most, most)};
+        };
+        const int small = i % 2 ? 1 : 20; // Of which fewer are clamped.
+        VideoColors colors = {Between(-most, most) / small,
+                              Between(0, 255),
+                              chromas(),
+                              chromas(),
+                              chromas(),
+                              Between(0, 255),
+                              i % 4 < 2};
+        for (VideoColors::Chromas* of :
+             {&colors.red, &colors.green, &colors.blue}) {
+            of->first /= small;
+            of->second /= small;
+        }
+        Bytes groups(4 * (Word() % 80));
+        for (unsigned char& byte : groups)
+            byte = static_cast<unsigned char>(Word());
+
+        ASSERT_EQ(Colored(lanes, groups, colors),
+                  Colored(VideoLanes::plain(), groups, colors))
+            << i;
     }
 }
 

@@ -12,6 +12,10 @@
 //
 // The lumas of 8 pairs fill a register in order, first, second, first, second;
 // so do the two chromas. That is also the order of the bytes in the groups.
+//
+// The other way there is nothing to carry. Weights are taken apart into
+// multiples of 65536 and rests, both of 16 bits, so that two samples at a time
+// are weighed exactly; the whole part of a sum is its high half.
 
 namespace zt_platform {
 
@@ -227,6 +231,123 @@ struct Carry
             {lowest(carry.second[0]), lowest(carry.second[1])}};
 }
 
+/// Weights for two samples in each 32 bits: multiples of 65536, in these units,
+/// and the rests, each of 16 bits.
+struct SampleWeights
+{
+    __m256i multiples;
+    __m256i rests;
+};
+
+[[gnu::target("avx2")]] SampleWeights sample_weights(int low, int high)
+{
+    const auto multiple = [](int weight) { return (weight + 0x8000) >> 16; };
+    // Of the rests, which may be negative, only the low halves are taken.
+    return {pair_of_words(multiple(low), multiple(high)),
+            pair_of_words(low, high & 0xFFFF)};
+}
+
+/// The weights of the samples of a group and their offsets.
+struct Colors
+{
+    SampleWeights first_luma;
+    SampleWeights second_luma;
+    SampleWeights red;
+    SampleWeights green;
+    SampleWeights blue;
+    __m256i luma_offset;   ///< In bytes, where the lumas are.
+    __m256i chroma_offset; ///< In words.
+};
+
+[[gnu::target("avx2")]] Colors colors_of(const VideoColors& video)
+{
+    return {sample_weights(video.luma, 0),
+            sample_weights(0, video.luma),
+            sample_weights(video.red.first, video.red.second),
+            sample_weights(video.green.first, video.green.second),
+            sample_weights(video.blue.first, video.blue.second),
+            _mm256_set1_epi16(static_cast<short>(video.luma_offset << 8)),
+            _mm256_set1_epi16(static_cast<short>(video.chroma_offset))};
+}
+
+/// Gives the sums of two samples each, in 32 bits.
+[[gnu::target("avx2")]] __m256i weighed(__m256i samples,
+                                        const SampleWeights& weights)
+{
+    const __m256i wholes = _mm256_madd_epi16(samples, weights.multiples);
+    return _mm256_add_epi32(_mm256_slli_epi32(wholes, 16),
+                            _mm256_madd_epi16(samples, weights.rests));
+}
+
+/// Two sums for each group: of its first and of its second pixel.
+struct Sums
+{
+    __m256i first;
+    __m256i second;
+};
+
+/// Gives the whole parts of one channel of 16 pixels, in order.
+[[gnu::target("avx2")]] __m256i channel_of(const Sums& lumas, __m256i chromas)
+{
+    return high_halves(_mm256_add_epi32(lumas.first, chromas),
+                       _mm256_add_epi32(lumas.second, chromas));
+}
+
+/// Stores 16 pixels of channels that are not clamped yet, the lowest first.
+[[gnu::target("avx2")]] void store_pixels(__m256i byte0, __m256i byte1,
+                                          __m256i byte2, __m256i byte3,
+                                          std::uint32_t* pixels)
+{
+    const __m256i even = _mm256_packus_epi16(byte0, byte2);
+    const __m256i odd = _mm256_packus_epi16(byte1, byte3);
+    const __m256i low_bytes = _mm256_unpacklo_epi8(even, odd);
+    const __m256i high_bytes = _mm256_unpackhi_epi8(even, odd);
+    const __m256i low = _mm256_unpacklo_epi16(low_bytes, high_bytes);
+    const __m256i high = _mm256_unpackhi_epi16(low_bytes, high_bytes);
+    auto* to = reinterpret_cast<__m256i*>(pixels);
+    _mm256_storeu_si256(to, _mm256_permute2x128_si256(low, high, 0x20));
+    _mm256_storeu_si256(to + 1, _mm256_permute2x128_si256(low, high, 0x31));
+}
+
+/// Makes 16 pixels of 8 groups.
+template <bool red_lowest>
+[[gnu::target("avx2")]] void color_block(const unsigned char* groups,
+                                         std::uint32_t* pixels,
+                                         const Colors& colors)
+{
+    const __m256i samples =
+        _mm256_loadu_si256(reinterpret_cast<const __m256i*>(groups));
+    const __m256i lumas =
+        _mm256_srli_epi16(_mm256_subs_epu8(samples, colors.luma_offset), 8);
+    const __m256i chromas =
+        _mm256_sub_epi16(_mm256_and_si256(samples, _mm256_set1_epi16(0x00FF)),
+                         colors.chroma_offset);
+    const Sums grey = {weighed(lumas, colors.first_luma),
+                       weighed(lumas, colors.second_luma)};
+    const __m256i red = channel_of(grey, weighed(chromas, colors.red));
+    const __m256i green = channel_of(grey, weighed(chromas, colors.green));
+    const __m256i blue = channel_of(grey, weighed(chromas, colors.blue));
+    const __m256i none = _mm256_setzero_si256();
+    if (red_lowest)
+        store_pixels(red, green, blue, none, pixels);
+    else
+        store_pixels(none, blue, green, red, pixels);
+}
+
+/// Makes pixels of as many groups as there are whole blocks of them.
+///
+/// Returns: the number of these groups.
+template <bool red_lowest>
+[[gnu::target("avx2")]] std::size_t
+color_blocks(const unsigned char* groups, std::uint32_t* pixels,
+             std::size_t pairs, const Colors& colors)
+{
+    std::size_t at = 0;
+    for (; at + block_pairs <= pairs; at += block_pairs)
+        color_block<red_lowest>(groups + 4 * at, pixels + 2 * at, colors);
+    return at;
+}
+
 class Avx2VideoLanes final : public VideoLanes
 {
 public:
@@ -245,6 +366,19 @@ public:
         carry = stored(wide);
         VideoLanes::mix(pixels + 2 * at, groups + 4 * at, pairs - at, video,
                         carry);
+    }
+
+    [[gnu::target("avx2")]] void color(const unsigned char* groups,
+                                       std::uint32_t* pixels, std::size_t pairs,
+                                       const VideoColors& video) const override
+    {
+        const Colors colors = colors_of(video);
+        const std::size_t done =
+            video.red_lowest
+                ? color_blocks<true>(groups, pixels, pairs, colors)
+                : color_blocks<false>(groups, pixels, pairs, colors);
+        VideoLanes::color(groups + 4 * done, pixels + 2 * done, pairs - done,
+                          video);
     }
 };
 

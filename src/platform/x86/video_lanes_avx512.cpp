@@ -232,6 +232,127 @@ stored(const Carry& carry)
             {highest(carry.second[0]), highest(carry.second[1])}};
 }
 
+/// Weights for two samples in each 32 bits: multiples of 65536, in these units,
+/// and the rests, each of 16 bits.
+struct SampleWeights
+{
+    __m512i multiples;
+    __m512i rests;
+};
+
+[[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] SampleWeights
+sample_weights(int low, int high)
+{
+    const auto multiple = [](int weight) { return (weight + 0x8000) >> 16; };
+    // Of the rests, which may be negative, only the low halves are taken.
+    return {pair_of_words(multiple(low), multiple(high)),
+            pair_of_words(low, high & 0xFFFF)};
+}
+
+/// The weights of the samples of a group and their offsets.
+struct Colors
+{
+    SampleWeights first_luma;
+    SampleWeights second_luma;
+    SampleWeights red;
+    SampleWeights green;
+    SampleWeights blue;
+    __m512i luma_offset;   ///< In bytes, where the lumas are.
+    __m512i chroma_offset; ///< In words.
+};
+
+[[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] Colors
+colors_of(const VideoColors& video)
+{
+    return {sample_weights(video.luma, 0),
+            sample_weights(0, video.luma),
+            sample_weights(video.red.first, video.red.second),
+            sample_weights(video.green.first, video.green.second),
+            sample_weights(video.blue.first, video.blue.second),
+            _mm512_set1_epi16(static_cast<short>(video.luma_offset << 8)),
+            _mm512_set1_epi16(static_cast<short>(video.chroma_offset))};
+}
+
+/// Gives the sums of two samples each, in 32 bits.
+[[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] __m512i
+weighed(__m512i samples, const SampleWeights& weights)
+{
+    const __m512i wholes = _mm512_madd_epi16(samples, weights.multiples);
+    return _mm512_dpwssd_epi32(_mm512_slli_epi32(wholes, 16), samples,
+                               weights.rests);
+}
+
+/// Two sums for each group: of its first and of its second pixel.
+struct Sums
+{
+    __m512i first;
+    __m512i second;
+};
+
+/// Gives the whole parts of one channel of 32 pixels, in order.
+[[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] __m512i
+channel_of(const Sums& lumas, __m512i chromas)
+{
+    return high_halves(_mm512_add_epi32(lumas.first, chromas),
+                       _mm512_add_epi32(lumas.second, chromas));
+}
+
+/// Stores 32 pixels of channels that are not clamped yet, the lowest first.
+[[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] void
+store_pixels(__m512i byte0, __m512i byte1, __m512i byte2, __m512i byte3,
+             std::uint32_t* pixels)
+{
+    const __m512i even = _mm512_packus_epi16(byte0, byte2);
+    const __m512i odd = _mm512_packus_epi16(byte1, byte3);
+    const __m512i low_bytes = _mm512_unpacklo_epi8(even, odd);
+    const __m512i high_bytes = _mm512_unpackhi_epi8(even, odd);
+    const __m512i low = _mm512_unpacklo_epi16(low_bytes, high_bytes);
+    const __m512i high = _mm512_unpackhi_epi16(low_bytes, high_bytes);
+    const __m512i left = _mm512_setr_epi64(0, 1, 8, 9, 2, 3, 10, 11);
+    const __m512i right = _mm512_setr_epi64(4, 5, 12, 13, 6, 7, 14, 15);
+    _mm512_storeu_si512(pixels, _mm512_permutex2var_epi64(low, left, high));
+    _mm512_storeu_si512(pixels + 16,
+                        _mm512_permutex2var_epi64(low, right, high));
+}
+
+/// Makes 32 pixels of 16 groups.
+template <bool red_lowest>
+[[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] void
+color_block(const unsigned char* groups, std::uint32_t* pixels,
+            const Colors& colors)
+{
+    const __m512i samples = _mm512_loadu_si512(groups);
+    const __m512i lumas =
+        _mm512_srli_epi16(_mm512_subs_epu8(samples, colors.luma_offset), 8);
+    const __m512i chromas =
+        _mm512_sub_epi16(_mm512_and_si512(samples, _mm512_set1_epi16(0x00FF)),
+                         colors.chroma_offset);
+    const Sums grey = {weighed(lumas, colors.first_luma),
+                       weighed(lumas, colors.second_luma)};
+    const __m512i red = channel_of(grey, weighed(chromas, colors.red));
+    const __m512i green = channel_of(grey, weighed(chromas, colors.green));
+    const __m512i blue = channel_of(grey, weighed(chromas, colors.blue));
+    const __m512i none = _mm512_setzero_si512();
+    if (red_lowest)
+        store_pixels(red, green, blue, none, pixels);
+    else
+        store_pixels(none, blue, green, red, pixels);
+}
+
+/// Makes pixels of as many groups as there are whole blocks of them.
+///
+/// Returns: the number of these groups.
+template <bool red_lowest>
+[[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] std::size_t
+color_blocks(const unsigned char* groups, std::uint32_t* pixels,
+             std::size_t pairs, const Colors& colors)
+{
+    std::size_t at = 0;
+    for (; at + block_pairs <= pairs; at += block_pairs)
+        color_block<red_lowest>(groups + 4 * at, pixels + 2 * at, colors);
+    return at;
+}
+
 class Avx512VideoLanes final : public VideoLanes
 {
 public:
@@ -249,6 +370,19 @@ public:
         carry = stored(wide);
         avx2_video_lanes()->mix(pixels + 2 * at, groups + 4 * at, pairs - at,
                                 video, carry);
+    }
+
+    [[gnu::target("avx512f,avx512bw,avx512vl,avx512vnni")]] void
+    color(const unsigned char* groups, std::uint32_t* pixels, std::size_t pairs,
+          const VideoColors& video) const override
+    {
+        const Colors colors = colors_of(video);
+        const std::size_t done =
+            video.red_lowest
+                ? color_blocks<true>(groups, pixels, pairs, colors)
+                : color_blocks<false>(groups, pixels, pairs, colors);
+        avx2_video_lanes()->color(groups + 4 * done, pixels + 2 * done,
+                                  pairs - done, video);
     }
 };
 
