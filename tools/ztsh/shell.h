@@ -17,11 +17,13 @@
 #include "words/geometry_words.h"
 #include "words/language_words.h"
 #include "words/picture_words.h"
+#include "words/playing_words.h"
 #include "words/plugin_words.h"
 #include "words/preference_words.h"
 #include "words/recognizer_words.h"
 #include "words/sequence_words.h"
 #include "words/shuttle_words.h"
+#include "words/sound_words.h"
 #include "words/time_words.h"
 #include "words/wait_words.h"
 #include "words/wire_words.h"
@@ -45,6 +47,8 @@ private:
 
     Runner runner;
     PictureTable pictures;
+    SoundTable sounds;
+    PlayedSounds played;
     Geometry geometry;
     ClockTable clocks;
     /// Whatever uses plug-ins stands behind it and goes before it.
@@ -62,6 +66,8 @@ private:
     ShuttleWords shuttles;
     GeometryWords geometry_words;
     WireWords wire_words;
+    SoundWords sound_words{runner, sounds, pictures};
+    PlayingWords playing{runner, sounds, clocks, played};
     PluginWords plugin_words{runner, plugins};
     RecognizerWords recognizer_words{runner, pictures, plugins.recognizers};
 };
