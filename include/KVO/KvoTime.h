@@ -355,22 +355,34 @@ private:
             .tick_count;
     }
 
-    /// Gives the whole frames in `count` ticks, 0 where there is no such frame.
-    /// Naming the common rates turns their divisions into multiplications.
+    /// For every rate in use, 2^32 by the ticks of its frame, rounded up.
+    struct FrameReciprocals
+    {
+        static constexpr int rates = 128;
+
+        constexpr FrameReciprocals()
+        {
+            for (int rate = 1; rate < rates; ++rate)
+                by_rate[rate] = static_cast<std::uint32_t>(
+                    (1LL << 32) / (ticks_per_second / rate) + 1);
+        }
+
+        std::uint32_t by_rate[rates] = {};
+    };
+    static const FrameReciprocals frame_reciprocals;
+
+    /// Gives the whole frames in `count` ticks of less than a second, 0 where
+    /// there is no such frame.
+    ///
+    /// A division by the frame becomes a multiplication at the rates in use: it
+    /// is exact, for the error of the reciprocal times a count below 6000 is
+    /// too small to reach the next frame.
     static constexpr int whole_frames(std::int32_t count, int fps)
     {
-        switch (fps) {
-        case 24:
-            return count / 250;
-        case 25:
-            return count / 240;
-        case 30:
-            return count / 200;
-        case 60:
-            return count / 100;
-        default:
-            break;
-        }
+        if (fps > 0 && fps < FrameReciprocals::rates)
+            return static_cast<int>(std::int64_t{count} *
+                                    frame_reciprocals.by_rate[fps] /
+                                    (1LL << 32));
         const std::int32_t frame = fps ? ticks_per_second / fps : 0;
         return frame ? count / frame : 0;
     }
@@ -386,6 +398,7 @@ private:
     }
 };
 
+inline constexpr KvoTime::FrameReciprocals KvoTime::frame_reciprocals = {};
 inline constexpr KvoTime KvoTime::ZERO = KvoTime::FromTicks(0);
 inline constexpr KvoTime KvoTime::FOREVER =
     KvoTime::FromTicks(48 * KvoTime::ticks_per_hour);

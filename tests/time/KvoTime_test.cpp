@@ -326,6 +326,14 @@ TEST(KvoTime, SplitEqualsTheLiteralFormulaAroundEveryBoundary)
             }
 }
 
+TEST(KvoTime, SplitEqualsTheLiteralFormulaForEveryRemainderAtEveryRateInUse)
+{
+    for (int fps = 1; fps <= 130; ++fps)
+        for (long ticks = -5999; ticks <= 5999; ++ticks)
+            ASSERT_EQ(PartsOf(ticks, fps), LiteralSplit(ticks, fps))
+                << ticks << " at " << fps;
+}
+
 TEST(KvoTime, TimecodeResolvesTheRate)
 {
     const DefaultRate rate(25);
