@@ -50,23 +50,24 @@ bool is_absolute(const char* path)
     return *path == '/';
 }
 
-/// Replaces a text by a copy of another, which may be a part of it. Without
-/// memory it stays.
-void replace(char*& text, const char* by)
+/// Replaces a text by a copy of another, which may be a part of it, and notes
+/// where that is from. Without memory both stay.
+void replace(char*& text, const char* by, Origin& origin, Origin found)
 {
     char* const copy = ZtNewString(by);
     if (!copy)
         return;
     delete[] text;
     text = copy;
+    origin = found;
 }
 
 /// Sets a text to the environment's, or else to the one that holds otherwise.
 void take_setting(char*& text, KvoPrefs::Setting setting,
                   const char* environment, const char* otherwise)
 {
-    replace(text, environment ? environment : otherwise);
-    origin_of(setting) = environment ? Origin::Environment : Origin::Default;
+    replace(text, environment ? environment : otherwise, origin_of(setting),
+            environment ? Origin::Environment : Origin::Default);
 }
 
 KvoSkipList& table()
@@ -131,8 +132,7 @@ const char* KvoPrefs::TableEntry::Default() const
 
 void KvoPrefs::TableEntry::keep(const char* text, Origin found)
 {
-    replace(value, text);
-    origin = found;
+    replace(value, text, origin, found);
 }
 
 KvoPrefs::KvoPrefs()
@@ -169,8 +169,8 @@ KvoPrefs::Origin KvoPrefs::OriginOf(Setting setting)
 void KvoPrefs::SetWorkEnv(const char* dir)
 {
     load_once();
-    replace(workenv, dir ? dir : default_workenv);
-    origin_of(Setting::WorkEnv) = dir ? Origin::SetHere : Origin::Default;
+    replace(workenv, dir ? dir : default_workenv, origin_of(Setting::WorkEnv),
+            dir ? Origin::SetHere : Origin::Default);
 }
 
 const char* KvoPrefs::WorkEnv()
@@ -182,8 +182,8 @@ const char* KvoPrefs::WorkEnv()
 void KvoPrefs::SetProject(const char* name)
 {
     load_once();
-    replace(project, name ? name : default_project);
-    origin_of(Setting::Project) = name ? Origin::SetHere : Origin::Default;
+    replace(project, name ? name : default_project, origin_of(Setting::Project),
+            name ? Origin::SetHere : Origin::Default);
 }
 
 const char* KvoPrefs::Project()
@@ -301,9 +301,9 @@ void KvoPrefs::load_once()
     known(Misc, "misc_data");
     known(CoordSys, right_handed);
     const char* const named = answers[DefaultProject].get();
-    replace(default_project, named ? named : first_project);
-    origin_of(Setting::DefaultProject) =
-        named ? Origin::QueryProgram : Origin::Default;
+    replace(default_project, named ? named : first_project,
+            origin_of(Setting::DefaultProject),
+            named ? Origin::QueryProgram : Origin::Default);
     const char* const axes = answers[CoordSys].get();
     coord_sys = axes && std::strcmp(axes, right_handed) != 0 ? 1 : 0;
 

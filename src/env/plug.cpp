@@ -1,6 +1,7 @@
 #include "ZT/plug.h"
 
 #include <cstdlib>
+#include <cstring>
 #include <memory>
 #include <new>
 #include <string>
@@ -83,9 +84,8 @@ ZtPlugCatalog::Plug* ZtPlugCatalog::AddPlug(const char* name, KvoObject* object)
     Plug* const plug = new (std::nothrow) Plug(name, object);
     if (!plug)
         return nullptr;
-    const int before = plugs.count;
-    plugs.Insert(plug);
-    if (plugs.count == before) {
+    const bool whole = std::strcmp(or_empty(plug->name), or_empty(name)) == 0;
+    if (!whole || !plugs.InsertUnique(plug)) {
         plug->object = nullptr;
         delete plug;
         return nullptr;

@@ -109,12 +109,15 @@ TEST(KvoPrefsMemory, WithoutMemorySettingsStayAsTheyAre)
         FailingMemory none;
         KvoPrefs::SetProject("shot2");
         KvoPrefs::SetProject(nullptr);
-        KvoPrefs::SetWorkEnv("/other");
+        KvoPrefs::SetWorkEnv(nullptr);
         KvoPrefs::SetVariable("KEPT", "other");
         KvoPrefs::SetVariable("NEVER_MADE", "value");
     }
 
     EXPECT_STREQ(KvoPrefs::ProjectDir(), "/work/user_data/shot1");
+    for (const auto setting :
+         {KvoPrefs::Setting::Project, KvoPrefs::Setting::WorkEnv})
+        EXPECT_EQ(KvoPrefs::OriginOf(setting), KvoPrefs::Origin::SetHere);
     EXPECT_STREQ(KvoPrefs::Variable("KEPT", ""), "value");
     EXPECT_EQ(KvoPrefs::Table().Search("NEVER_MADE"), nullptr);
 }
@@ -145,6 +148,9 @@ TEST(KvoPrefsMemory, AVariableThatCannotBeLookedUpReadsAsEmpty)
     FailingMemory none;
 
     EXPECT_STREQ(KvoPrefs::Variable("UNHEARD_OF", "x"), "");
+    KvoPrefs::TableEntry unheard("UNHEARD_OF", "x");
+    EXPECT_STREQ(unheard.Value(), "");
+    EXPECT_EQ(unheard.ValueOrigin(), KvoPrefs::Origin::NotAsked);
     EXPECT_NE(KvoPrefs::WireDir(), nullptr);
     EXPECT_NE(KvoPrefs::ProjectDir(), nullptr);
     EXPECT_NE(KvoPrefs::HelpDir(), nullptr);

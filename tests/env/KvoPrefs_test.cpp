@@ -328,6 +328,22 @@ TEST(KvoPrefs, OtherStaticObjectsMayAskBeforeTheSettingsAreRead)
     EXPECT_EQ(installation.Asked(), asked_at_load);
 }
 
+TEST(KvoPrefs, WhatOtherStaticObjectsSetBeforeTheSettingsAreReadStays)
+{
+    for (const auto& [what, directory] : std::vector<std::pair<Lines, Lines>>{
+             {{"project"}, {"/work/user_data/early/wire"}},
+             {{"workenv"}, {"early/user_data/shot1/wire"}},
+             {{"variable"}, {"/work/user_data/shot1/early"}}}) {
+        Installation installation;
+        installation.Knows({"QUARN_WIRE_DIR wire"});
+        installation.Set("QUARN_WORKENV=/work");
+        installation.Set("QUARN_PROJECT=shot1");
+        installation.Set("PROBE_SETS_FIRST=" + what[0]);
+
+        EXPECT_EQ(installation.Ask({"wire"}), directory);
+    }
+}
+
 TEST(KvoPrefs, WithoutQueryProgramNothingIsStartedAndNothingIsSaid)
 {
     Installation installation;

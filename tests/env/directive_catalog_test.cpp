@@ -102,11 +102,13 @@ TEST(ZtDirectiveCatalog, TheProgramMayAddWordsToo)
     {
         ZtDirectiveCatalog catalog(dispatcher);
         catalog.AddPlug("Hello", new Telling("Hello", "acted"));
+        catalog.AddPlug("Bye", new Telling("Bye", "left"));
         catalog.AddPlug("null", nullptr);
 
         Carry(dispatcher, "hello\n");
+        Carry(dispatcher, "bye\n");
     }
-    EXPECT_EQ(TakeTold(), (Names{"acted"}));
+    EXPECT_EQ(TakeTold(), (Names{"acted", "left"}));
     EXPECT_EQ(reports.Text(),
               "Warning: Plug-in of the program: null is no directive\n");
     std::ostringstream words;

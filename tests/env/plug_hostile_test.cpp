@@ -4,18 +4,23 @@
 #include <csignal>
 #include <fcntl.h>
 #include <fstream>
+#include <iostream>
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
 #include <gtest/gtest.h>
 
 #include "ZT/signals.h"
+#include "ZT/timer.h"
 #include "env/plugin_tests.h"
 #include "platform/dynlib.h"
 #include "support/CapturedStderr.h"
 #include "support/ErrorTrap.h"
 #include "support/FailingMemory.h"
+#include "support/FakeAlarm.h"
+#include "support/FakeClock.h"
 
 namespace {
 
@@ -369,7 +374,9 @@ TEST(HostilePlugIns, MemoryThatRunsOutLeavesACatalogThatWorks)
         PlainCatalog catalog;
         {
             FailingMemory none(times, 1);
-            catalog.AddPlug("host", nullptr);
+            const ZtPlugCatalog::Plug* const made =
+                catalog.AddPlug("host", nullptr);
+            EXPECT_EQ(made, catalog.FindPlug("host")) << times;
             catalog.ScanDirectory(path.c_str());
             catalog.FindPlugHelpFilename("host", "txt");
             failed = FailingMemory::Failed();
@@ -438,4 +445,30 @@ TEST(HostilePlugIns, ASignalHookThatIsLeftBehindEndsTheProcess)
             _exit(0);
         },
         "");
+}
+
+TEST(HostilePlugIns, ATimerCallbackThatIsLeftBehindEndsTheProcess)
+{
+    PluginDir dir("leaves_timer_callback");
+    const auto is_crash = [](int status) {
+        // By a signal, or by what watches memory; a name that the loader does
+        // not find would end it with another code.
+        return WIFSIGNALED(status) || WEXITSTATUS(status) == 1;
+    };
+
+    EXPECT_EXIT(
+        {
+            FakeClock clock;
+            FakeAlarm alarm(clock);
+            ZtTimerBeat::start();
+            ZtTimer own(0, KvoTime::FOREVER);
+            TestCatalog catalog;
+            catalog.ScanOneDir(dir.Dir().c_str());
+            if (!IsLoaded(dir.Path("leaves_timer_callback.t.so")))
+                std::cerr << "it is closed" << std::endl;
+            for (int beat = 0; beat < 10; ++beat)
+                alarm.Step();
+            _exit(0);
+        },
+        is_crash, "it is closed");
 }

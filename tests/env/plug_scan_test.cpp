@@ -28,22 +28,6 @@ struct Scan
     Names told;
 };
 
-class CurrentDirectory
-{
-public:
-    explicit CurrentDirectory(const std::string& path)
-        : before(std::filesystem::current_path())
-    {
-        std::filesystem::current_path(path);
-    }
-    ~CurrentDirectory() { std::filesystem::current_path(before); }
-    CurrentDirectory(const CurrentDirectory&) = delete;
-    CurrentDirectory& operator=(const CurrentDirectory&) = delete;
-
-private:
-    std::filesystem::path before;
-};
-
 } // namespace
 
 // --- which files -----------------------------------------------------------
@@ -339,6 +323,7 @@ TEST(ZtPlugCatalog, AFileThatIsNoneIsTheLoadersToTell)
     CapturedStderr err;
 
     EXPECT_EQ(catalog.ScanFile("/nowhere.t.so"), 0);
+    EXPECT_STREQ(catalog.Directory(), "/");
     EXPECT_EQ(catalog.ScanFile(nullptr), 0);
 
     EXPECT_EQ(err.Text().find("/nowhere.t.so: cannot open"), 0U);

@@ -392,6 +392,9 @@ TEST_F(PlugHelp, OfAPlugFromNowhereIsLookedForOnlyInAnAbsoluteDirectory)
 {
     TestCatalog unscanned;
     unscanned.AddPlug("edge", nullptr);
+    // One without a slash is none of the current directory.
+    CurrentDirectory here(dir.Dir());
+    dir.Write("Help/edge.t.html", "");
     EXPECT_EQ(unscanned.FindPlugHelpFilename("edge", "html"), nullptr);
     SetVariable absolute("QUARN_PLUGIN_HELP", dir.Dir().c_str());
     dir.Write("edge.t.html", "");

@@ -103,6 +103,23 @@ private:
     bool was_set = false;
 };
 
+/// Another current directory, for as long as this lives.
+class CurrentDirectory
+{
+public:
+    explicit CurrentDirectory(const std::string& path)
+        : before(std::filesystem::current_path())
+    {
+        std::filesystem::current_path(path);
+    }
+    ~CurrentDirectory() { std::filesystem::current_path(before); }
+    CurrentDirectory(const CurrentDirectory&) = delete;
+    CurrentDirectory& operator=(const CurrentDirectory&) = delete;
+
+private:
+    std::filesystem::path before;
+};
+
 using Names = std::vector<std::string>;
 
 #endif

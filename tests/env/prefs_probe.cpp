@@ -3,6 +3,7 @@
 
 #include <KVO/KvoPrefs.h>
 
+#include <cstdlib>
 #include <cstring>
 #include <functional>
 #include <iostream>
@@ -12,9 +13,22 @@
 
 namespace {
 
-/// Asked for before the objects of this file and of a static library are made.
-const std::string early __attribute__((init_priority(101))) =
-    KvoPrefs::WireDir();
+/// The first call of all, before the objects of this file and of a static
+/// library are made: what PROBE_SETS_FIRST says is set, then a question.
+std::string first_call()
+{
+    const char* set = std::getenv("PROBE_SETS_FIRST");
+    const std::string what = set ? set : "";
+    if (what == "project")
+        KvoPrefs::SetProject("early");
+    else if (what == "workenv")
+        KvoPrefs::SetWorkEnv("early");
+    else if (what == "variable")
+        KvoPrefs::SetVariable("QUARN_WIRE_DIR", "early");
+    return KvoPrefs::WireDir();
+}
+
+const std::string early __attribute__((init_priority(101))) = first_call();
 
 /// The arguments of the probe, taken one by one.
 class Words

@@ -65,9 +65,14 @@ void FrameServer::Client::Send(const std::string& bytes)
     EXPECT_EQ(sent, static_cast<ssize_t>(bytes.size()));
 }
 
-std::string FrameServer::Client::Finish()
+void FrameServer::Client::EndSending()
 {
     shutdown(socket, SHUT_WR);
+}
+
+std::string FrameServer::Client::Finish()
+{
+    EndSending();
     return Read(std::string::npos);
 }
 

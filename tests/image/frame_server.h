@@ -28,6 +28,9 @@ public:
 
         void Send(const std::string& bytes);
 
+        /// Ends what is sent, so that the other side sees an end.
+        void EndSending();
+
         /// Sends nothing more and waits for the client to close. What comes
         /// until then is given.
         std::string Finish();

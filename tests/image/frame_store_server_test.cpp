@@ -8,6 +8,7 @@
 #include <ZT/timer.h>
 
 #include <chrono>
+#include <csignal>
 #include <filesystem>
 #include <thread>
 #include <unistd.h>
@@ -40,7 +41,12 @@ PixelList Picture()
 class frame_store_server : public testing::Test
 {
 protected:
-    frame_store_server() { zt_image::use_frame_store_lock(lock.c_str()); }
+    frame_store_server()
+    {
+        zt_image::use_frame_store_lock(lock.c_str());
+        // Whoever started the test may have it ignored.
+        std::signal(SIGPIPE, SIG_DFL);
+    }
     ~frame_store_server() override { zt_image::use_frame_store_lock(nullptr); }
 
     /// Sends the picture to a host and gives what was printed.
@@ -165,6 +171,17 @@ TEST_F(frame_store_server, AResetAfterTheNameIsAFailureAndNoSignal)
 {
     EXPECT_EQ(SendToServer([](Client& client) {
                   client.Read(64);
+                  client.Reset();
+              }),
+              started + write_error);
+}
+
+// The one that the system answers with a signal, unless it is told not to.
+TEST_F(frame_store_server, AResetAfterAnOrderlyEndIsAFailureAndNoSignal)
+{
+    EXPECT_EQ(SendToServer([](Client& client) {
+                  client.Read(64);
+                  client.EndSending();
                   client.Reset();
               }),
               started + write_error);
