@@ -69,9 +69,10 @@ bool FilePort::get_ready()
 
 bool FilePort::get_ready_to_play()
 {
-    if (!output_wish || std::strlen(output_wish) >= sizeof output)
+    const std::size_t length = output_wish ? std::strlen(output_wish) : 0;
+    if (length == 0 || length >= sizeof output)
         return false;
-    std::strcpy(output, output_wish);
+    std::memcpy(output, output_wish, length + 1);
     file.reset(new (std::nothrow) NewFile(output));
     bytes_kept = 0;
     phase = Phase::Waiting;

@@ -39,6 +39,7 @@ public:
         std::uintptr_t index = 0;
         while (&places[index].record != record)
             ++index;
+        // NOLINTNEXTLINE(performance-no-int-to-ptr): never followed
         return reinterpret_cast<void*>(
             (std::uintptr_t{places[index].generation} << index_bits) | index);
     }

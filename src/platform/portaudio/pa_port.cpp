@@ -47,8 +47,8 @@ void apply_levels(std::int16_t* samples, unsigned long frames, int channels,
     const std::int32_t levels[most_channels] = {left, right};
     for (unsigned long number = 0; number < frames; ++number)
         for (int channel = 0; channel < channels; ++channel, ++samples)
-            *samples =
-                static_cast<std::int16_t>(*samples * levels[channel] / full);
+            *samples = static_cast<std::int16_t>(
+                *samples * levels[channel % most_channels] / full);
 }
 
 bool PaPort::open(const AudioPortConfig& config)
