@@ -1,5 +1,7 @@
 #include "image/zoom.h"
 
+#include "platform/pixel_lanes.h"
+
 #include <algorithm>
 #include <cstddef>
 #include <cstdlib>
@@ -52,6 +54,7 @@ bool zoom_nearest(const ZtPixel* source, ZtPixel* destination, int ax, int ay,
     const int* columns = column_map.columns(ax, bx);
     if (!columns)
         return false;
+    const zt_platform::PixelLanes& lanes = zt_platform::PixelLanes::current();
     std::size_t width = static_cast<std::size_t>(bx);
     int shown = -1; // The source row that the row before was made of.
     for (int y = 0; y < by; ++y, destination += width) {
@@ -63,8 +66,7 @@ bool zoom_nearest(const ZtPixel* source, ZtPixel* destination, int ax, int ay,
         }
         const ZtPixel* pixels = source + static_cast<std::size_t>(row) *
                                              static_cast<std::size_t>(ax);
-        for (std::size_t x = 0; x < width; ++x)
-            destination[x] = pixels[columns[x]];
+        lanes.pick(pixels, columns, destination, width);
         shown = row;
     }
     return true;

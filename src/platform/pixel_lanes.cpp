@@ -65,6 +65,13 @@ void PixelLanes::turn(const std::uint32_t* words, std::size_t stride,
                 words[row * stride + column];
 }
 
+void PixelLanes::pick(const std::uint32_t* words, const int* places,
+                      std::uint32_t* picked, std::size_t count) const
+{
+    for (std::size_t i = 0; i < count; ++i)
+        picked[i] = words[places[i]];
+}
+
 void PixelLanes::average(const Average& lines, std::uint32_t* averages,
                          std::size_t count) const
 {

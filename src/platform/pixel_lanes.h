@@ -47,6 +47,12 @@ public:
     virtual void turn(const std::uint32_t* words, std::size_t stride,
                       std::uint32_t* columns, std::size_t columns_stride) const;
 
+    /// Picks the words at these places.
+    ///
+    /// Requires: places of at least 0, in `words`.
+    virtual void pick(const std::uint32_t* words, const int* places,
+                      std::uint32_t* picked, std::size_t count) const;
+
     /// Averages lines of words, the three low bytes of each word by itself;
     /// the high byte of the result is 0.
     ///

@@ -139,6 +139,23 @@ TEST_P(PixelLanesTest, ABlockIsTurned)
                       column < 8 ? words[column * 11 + row] : 0x01234567);
 }
 
+TEST_P(PixelLanesTest, WordsArePickedFromTheirPlaces)
+{
+    const Words words = RandomWords(300);
+    for (std::size_t count = 0; count < 100; ++count) {
+        std::vector<int> places(count);
+        for (int& place : places)
+            place = static_cast<int>(Word() % words.size());
+        Words picked(count + 1, 0x01234567);
+
+        lanes.pick(words.data(), places.data(), picked.data(), count);
+
+        for (std::size_t i = 0; i < count; ++i)
+            ASSERT_EQ(picked[i], words[static_cast<std::size_t>(places[i])]);
+        EXPECT_EQ(picked[count], 0x01234567u);
+    }
+}
+
 TEST_P(PixelLanesTest, AveragesFollowTheirFormula)
 {
     for (int i = 0; i < 2000; ++i) {

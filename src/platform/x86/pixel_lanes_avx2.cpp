@@ -104,6 +104,17 @@ struct Columns
              _mm256_unpackhi_epi64(high01, high23)}};
 }
 
+constexpr std::size_t picked_words = 8;
+
+[[gnu::target("avx2")]] __m256i pick_block(const std::uint32_t* words,
+                                           __m256i places)
+{
+    // Starting from no words at all, nothing older is waited for.
+    return _mm256_mask_i32gather_epi32(
+        _mm256_setzero_si256(), reinterpret_cast<const int*>(words), places,
+        _mm256_set1_epi32(-1), sizeof *words);
+}
+
 /// Pixels that are averaged together, and registers for their values: three a
 /// pixel, four in a register.
 constexpr std::size_t averaged_pixels = 8;
@@ -277,6 +288,16 @@ public:
                 columns + (i + 4) * columns_stride,
                 _mm256_permute2x128_si256(upper.both[i], lower.both[i], 0x31));
         }
+    }
+
+    [[gnu::target("avx2")]] void pick(const std::uint32_t* words,
+                                      const int* places, std::uint32_t* picked,
+                                      std::size_t count) const override
+    {
+        std::size_t at = 0;
+        for (; at + picked_words <= count; at += picked_words)
+            store(picked + at, pick_block(words, load(places + at)));
+        PixelLanes::pick(words, places + at, picked + at, count - at);
     }
 
     [[gnu::target("avx2")]] void average(const Average& lines,
