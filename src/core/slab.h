@@ -7,7 +7,8 @@
 /// Pieces are carved from large slabs, one behind the other, and are never
 /// given back: a container keeps what it frees in a chain of its own and takes
 /// from there first. That makes a piece cheap, keeps neighbours close together
-/// and lets a whole chain of links be freed by one splice.
+/// and lets a whole chain of links be freed by one splice. The slabs grow with
+/// what is asked for, up to 32 MiB, so that many links lie on large pages.
 ///
 /// Everything is constant-initialised and never destroyed, so containers may
 /// live before `main` and after it.

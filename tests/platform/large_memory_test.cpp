@@ -1,5 +1,6 @@
 #include "platform/large_memory.h"
 
+#include <cerrno>
 #include <cstdint>
 #include <cstdlib>
 #include <cstring>
@@ -78,6 +79,19 @@ TEST(large_memory, ALargeBlockAsksForLargePagesWhereTheSystemHasThem)
 
     EXPECT_EQ(asked, SystemHasLargePages());
     std::free(block);
+}
+
+TEST(large_memory, RefusedAdviceLeavesTheLastFailureAlone)
+{
+    const std::size_t bytes = std::size_t{4} << 20;
+    void* gone = mmap(nullptr, bytes, PROT_READ | PROT_WRITE,
+                      MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    munmap(gone, bytes);
+
+    errno = 0;
+    zt_platform::prefer_large_pages(gone, bytes);
+
+    EXPECT_EQ(errno, 0);
 }
 
 } // namespace
