@@ -62,7 +62,7 @@ TEST(Slab, IsASmallOneWhenALargeOneIsRefused)
 
     char* piece = nullptr;
     while (!FailingMemory::Failed())
-        ASSERT_NE(piece = Slab::carve(piece_bytes), nullptr);
+        ASSERT_NE(piece = Carve(), nullptr);
 
     EXPECT_NE(piece, nullptr);
 }
