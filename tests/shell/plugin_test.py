@@ -10,10 +10,19 @@ import shutil
 import subprocess
 import sys
 import tempfile
+import time
 import unittest
 
 SHELL, TREE, PLUGINS = sys.argv[1:4]
 OTHER_NAME = "is not found by scans: its name does not end in "
+
+
+def runs(process):
+    """Tells whether the process of a folder of /proc is there and no zombie."""
+    try:
+        return "\nState:\tZ" not in (process / "status").read_text()
+    except (FileNotFoundError, ProcessLookupError):
+        return False
 
 
 class PluginTest(unittest.TestCase):
@@ -201,6 +210,23 @@ class New(PluginTest):
                          ["CMakeLists.txt", "Edge.cpp"])
         self.assertIn("KIND recognizer",
                       (self.dir / "a/b/CMakeLists.txt").read_text())
+
+    def test_a_check_that_is_ended_leaves_no_process(self):
+        checking = subprocess.Popen(
+            [SHELL, "plugin", "check", self.put("never_returns")],
+            stdin=subprocess.DEVNULL)
+        children = pathlib.Path(f"/proc/{checking.pid}/task/{checking.pid}"
+                                "/children")
+        while not children.read_text():
+            self.assertIsNone(checking.poll())
+            time.sleep(0.01)
+        child = pathlib.Path("/proc") / children.read_text().split()[0]
+        checking.terminate()
+        checking.wait(timeout=100)
+        deadline = time.monotonic() + 20
+        while runs(child):
+            self.assertLess(time.monotonic(), deadline)
+            time.sleep(0.01)
 
     def test_nothing_that_is_there_is_replaced(self):
         (self.dir / "Hello").mkdir()

@@ -79,6 +79,17 @@ class Signals(unittest.TestCase):
                 stream.close()
             (self.directory / "started").unlink()
 
+    def test_a_pipe_that_nobody_writes_to_is_given_up(self):
+        os.mkfifo(self.directory / "pipe")
+        for arguments in (["pipe"], ["-c", "Include pipe; Echo no"]):
+            shell = self.start(*arguments)
+            # Long enough to come to the pipe; what comes before ends as well.
+            time.sleep(0.5)
+            shell.send_signal(signal.SIGINT)
+            output, errors = shell.communicate(timeout=SECONDS)
+            self.assertEqual((shell.returncode, output, errors),
+                             (130, "", ""))
+
     def test_interrupting_a_command_ends_the_script(self):
         shell = self.start("-c", ENDLESS + "; Echo no")
         self.wait_for_file("started")

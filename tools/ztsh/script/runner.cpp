@@ -94,6 +94,8 @@ void Runner::RunFile(const std::string& name)
 {
     std::string why;
     int descriptor = OpenScript(name, why);
+    if (descriptor < 0 && StopSignal() != 0)
+        return; // The wait for somebody who writes to a pipe was cut short.
     if (descriptor < 0) {
         std::cerr << "ztsh: cannot read script " << name << ": " << why << "\n";
         outcome.Note(ExitCannotRead);
@@ -234,6 +236,8 @@ Included Runner::include_file(const std::string& name)
     }
     std::string why;
     int descriptor = OpenScript(name, why);
+    if (descriptor < 0 && StopSignal() != 0)
+        return Included::Ran;
     std::error_code ignored;
     if (descriptor < 0 && !std::filesystem::is_directory(name, ignored)) {
         outcome.Note(ExitCannotRead);

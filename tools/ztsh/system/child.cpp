@@ -7,6 +7,7 @@
 #include <fcntl.h>
 #include <iostream>
 #include <poll.h>
+#include <sys/prctl.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -15,8 +16,13 @@ namespace ztsh {
 
 namespace {
 
-[[noreturn]] void be_the_child(const std::function<int()>& body, int errors)
+[[noreturn]] void be_the_child(const std::function<int()>& body, int errors,
+                               pid_t parent)
 {
+    // What waits for this, and ends it in time, may be ended itself.
+    prctl(PR_SET_PDEATHSIG, SIGKILL);
+    if (getppid() != parent)
+        _exit(1);
     rlimit no_core = {0, 0};
     setrlimit(RLIMIT_CORE, &no_core);
     for (int signal : {SIGINT, SIGTERM, SIGSEGV, SIGBUS, SIGABRT, SIGALRM})
@@ -71,10 +77,11 @@ ChildEnd RunInChild(const std::function<int()>& body, int seconds)
     std::cout.flush();
     std::cerr.flush();
     std::fflush(nullptr);
+    const pid_t parent = getpid();
     pid_t child = fork();
     if (child == 0) {
         close(ends[0]);
-        be_the_child(body, ends[1]);
+        be_the_child(body, ends[1], parent);
     }
     close(ends[1]);
     if (child > 0) {

@@ -20,7 +20,7 @@ struct ChildEnd
 };
 
 /// Runs `body` in a child process, with nothing on standard input and output,
-/// and waits for it.
+/// and waits for it. Whatever ends this process ends the child too.
 ///
 /// Units: `seconds` at most.
 ChildEnd RunInChild(const std::function<int()>& body, int seconds);
