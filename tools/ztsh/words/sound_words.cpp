@@ -151,11 +151,13 @@ bool SoundWords::look(const std::string& name, const KvoStatement& statement)
 std::unique_ptr<HeldSound> SoundWords::make(const SoundStep& step)
 {
     std::unique_ptr<HeldSound> made;
+    const long before = runner.outcome.Reports();
     switch (step.action) {
     case SoundAction::Load:
         made.reset(new HeldSound{KvoSound(step.text.c_str()), step.text});
         if (!made->sound.samples) {
-            ZtError("%s: cannot load %s\n", word, step.text.c_str());
+            if (runner.outcome.Reports() == before)
+                ZtError("%s: %s has no frames\n", word, step.text.c_str());
             made.reset();
         }
         return made;
