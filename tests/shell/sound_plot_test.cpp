@@ -119,6 +119,19 @@ TEST(Spectrum, ShowsAFullSineAtItsFrequencyUpToTheTop)
         EXPECT_LT(drawn.Rows(column).size(), peak / 2) << column;
 }
 
+TEST(Spectrum, OfFewColumnsShowsWhatFallsBetweenTheirMiddles)
+{
+    for (const long frames : {300L, 2048L, 20000L}) {
+        Drawn drawn(11, 96);
+
+        DrawSpectrum(Sine(1000, frames), drawn.image);
+
+        // 1000 of 4000 hz lie in column 2 of 0 to 10.
+        EXPECT_GE(drawn.Rows(2).size(), 94U) << frames;
+        EXPECT_LE(drawn.Rows(8).size(), 48U) << frames;
+    }
+}
+
 TEST(Spectrum, OfSilenceIsEmpty)
 {
     Drawn drawn(10, 10);

@@ -113,19 +113,23 @@ void DrawSpectrum(const KvoSound& sound, ZtImageSGI& picture)
     constexpr double floor = -96;
     const long count = std::min(sound.frames, most_frames);
     const long windows = std::min(sound.frames / count, most_windows);
-    std::vector<double> power(static_cast<std::size_t>(picture.width), 0.0);
+    // So many frequencies that none falls between two of them.
+    const int in_column = static_cast<int>(count / 2 / picture.width + 1);
+    std::vector<double> power(
+        static_cast<std::size_t>(picture.width * in_column), 0.0);
     for (long i = 0; i < windows; ++i) {
         const long first =
             windows > 1 ? (sound.frames - count) * i / (windows - 1) : 0;
         const std::vector<double> window = window_at(sound, first, count);
-        for (std::size_t x = 0; x < power.size(); ++x)
-            power[x] += power_at(window, 0.5 * (static_cast<double>(x) + 0.5) /
+        for (std::size_t k = 0; k < power.size(); ++k)
+            power[k] += power_at(window, 0.5 * (static_cast<double>(k) + 0.5) /
                                              static_cast<double>(power.size()));
     }
     for (int x = 0; x < picture.width; ++x) {
-        const double mean =
-            power[static_cast<std::size_t>(x)] / static_cast<double>(windows);
-        const double decibels = 10 * std::log10(std::max(mean, 1e-20));
+        const auto from = power.begin() + x * in_column;
+        const double loudest = *std::max_element(from, from + in_column) /
+                               static_cast<double>(windows);
+        const double decibels = 10 * std::log10(std::max(loudest, 1e-20));
         const double share = std::clamp(1 - decibels / floor, 0.0, 1.0);
         draw_column(picture, x, 0,
                     static_cast<long>(share * picture.height) - 1, line_colour);

@@ -141,7 +141,8 @@ private:
 
     bool take_word(const char* text)
     {
-        return TakeWord(statement, text, next) || missing(text);
+        return TakeWord(statement, text, next) ||
+               missing(std::string("the word ") + text);
     }
 
     bool take_text()
