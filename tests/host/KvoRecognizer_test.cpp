@@ -13,6 +13,7 @@
 #include "ZT/image_sgi.h"
 #include "support/CapturedStderr.h"
 #include "support/ErrorTrap.h"
+#include "support/FailingMalloc.h"
 #include "support/FailingMemory.h"
 #include "support/TempDir.h"
 
@@ -565,6 +566,25 @@ TEST(KvoRecognizerTarget, WithoutMemoryThereIsNoPicture)
         }
         EXPECT_TRUE(!target.picture || FirstPixel(target) == red);
     }
+}
+
+TEST(KvoRecognizerTarget, WithoutMemoryNoPictureOfAnotherSizeIsKept)
+{
+    TempDir directory;
+    const std::string path = WritePicture(directory, "a.rgb", 2, 2, red);
+    KvoRecognizerTarget target("door");
+
+    const int failures = WithEveryRequestFailing(
+        [&] { target.LoadPicture(nullptr, path.c_str()); },
+        [&] {
+            if (!target.picture)
+                return;
+            EXPECT_EQ(target.picture->width, 160);
+            EXPECT_EQ(target.picture->height, 121);
+        });
+
+    EXPECT_GT(failures, 3);
+    EXPECT_EQ(FirstPixel(target), red);
 }
 
 TEST(KvoRecognizerTarget, ThePictureNameIsWrittenWithoutItsHead)
