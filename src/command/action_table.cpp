@@ -58,10 +58,9 @@ KvoToken::action_table(const char* special_characters)
     if (KvoObject* known = tables.Search(specials))
         return static_cast<ActionTable*>(known);
     auto* made = new (std::nothrow) ActionTable(specials);
-    if (made && std::strcmp(made->name, specials) == 0) {
-        tables.Insert(made);
+    if (made && std::strcmp(made->name, specials) == 0 &&
+        tables.InsertUnique(made))
         return made;
-    }
     delete made;
     alignas(ActionTable) static unsigned char place[sizeof(ActionTable)];
     static const ActionTable* stand_in = new (place) ActionTable("");

@@ -2,7 +2,13 @@
 
 #include <cstddef>
 
+#include "support/FailingMemory.h"
+
 namespace {
+
+// Brings in the `new` that is made of `malloc`, also where a sanitizer has one
+// of its own to offer.
+[[maybe_unused]] bool (*const own_new)() = FailingMemory::Failed;
 
 bool counting;
 bool only_first;
