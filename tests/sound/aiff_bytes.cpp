@@ -1,6 +1,8 @@
 #include "sound/aiff_bytes.h"
 
+#include <algorithm>
 #include <cmath>
+#include <utility>
 
 std::string ByteString(std::initializer_list<int> bytes)
 {
@@ -67,13 +69,13 @@ namespace {
 class Taker
 {
 public:
-    explicit Taker(const std::string& text) : rest(text) {}
+    explicit Taker(std::string content) : text(std::move(content)) {}
 
     std::string Text(std::size_t bytes)
     {
-        whole = whole && rest.size() >= bytes;
-        const std::string taken = whole ? rest.substr(0, bytes) : "";
-        rest.erase(0, bytes);
+        whole = whole && Left() >= bytes;
+        const std::string taken = whole ? text.substr(at, bytes) : "";
+        at += std::min(bytes, Left());
         return taken;
     }
 
@@ -85,13 +87,14 @@ public:
         return value;
     }
 
-    bool IsEmpty() const { return rest.empty(); }
-    std::size_t Left() const { return rest.size(); }
+    bool IsEmpty() const { return Left() == 0; }
+    std::size_t Left() const { return text.size() - at; }
 
     bool whole = true;
 
 private:
-    std::string rest;
+    std::string text;
+    std::size_t at = 0;
 };
 
 long double Extended(Taker& from)
