@@ -2,8 +2,10 @@
 
 #include "platform/byte_order.h"
 #include "platform/x86/sample_lanes_avx2.h"
+#include "platform/x86/sample_lanes_avx512.h"
 
 #include <algorithm>
+#include <iterator>
 
 namespace zt_platform {
 
@@ -134,8 +136,17 @@ const SampleLanes& SampleLanes::plain()
 
 const SampleLanes& SampleLanes::fastest()
 {
-    const SampleLanes* wide = avx2_sample_lanes();
-    return wide ? *wide : plain_lanes;
+    std::size_t number = 0;
+    while (numbered(number + 1))
+        ++number;
+    return *numbered(number);
+}
+
+const SampleLanes* SampleLanes::numbered(std::size_t number)
+{
+    const SampleLanes* const all[] = {&plain_lanes, avx2_sample_lanes(),
+                                      avx512_sample_lanes()};
+    return number < std::size(all) ? all[number] : nullptr;
 }
 
 const SampleLanes& SampleLanes::current()

@@ -48,7 +48,7 @@ public:
     /// Adds the squares of the samples, each divided by 32768, to `sum`, one
     /// after the other in single precision.
     ///
-    /// Requires: `sum` is 0, or 2^-60 to 2^60.
+    /// Requires: `sum` is 0 to 2^60.
     virtual float sum_of_squares(const short* samples, std::size_t count,
                                  float sum) const;
 
@@ -97,6 +97,12 @@ public:
 
     /// Gives the fastest that this processor can do.
     static const SampleLanes& fastest();
+
+    /// Gives the plain ones for number 0, and for each further number faster
+    /// ones.
+    ///
+    /// Returns: null for more than this processor can do.
+    static const SampleLanes* numbered(std::size_t number);
 
 protected:
     ~SampleLanes() = default;

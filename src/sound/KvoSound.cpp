@@ -304,15 +304,17 @@ void KvoSound::Mono(int channel)
 {
     if (!zt_sound::is_ready(*this) || channels == 1)
         return;
-    if (channel < 0 || channel > 2)
+    const bool is_known = channel >= 0 && channel <= 2;
+    if (!is_known)
         ZtError("Must choose either channel 1 or 2.\n");
-    short* one = zt_sound::new_silence(frames, 1);
+    short* one = is_known ? zt_sound::new_samples(frames, 1)
+                          : zt_sound::new_silence(frames, 1);
     if (!one && frames > 0)
         return;
     if (channel == 0)
         SampleLanes::current().average(samples, one,
                                        zt_sound::frames_of(*this));
-    else if (channel == 1 || channel == 2)
+    else if (is_known)
         pick_channel(*this, static_cast<std::size_t>(channel - 1), one);
     zt_sound::replace_samples(*this, one, frames);
     channels = 1;

@@ -12,15 +12,15 @@
 
 // The two rates meet on a grid that both divide: a frame in lies `up` places
 // after the one before, a frame out `down` places. The band is limited on the
-// way: a few thousand frames at a time are filtered into a buffer that stays in
+// way: some thousand frames at a time are filtered into a buffer that stays in
 // the cache, and the frames out are made from there.
 
 using zt_platform::SampleLanes;
 
 namespace {
 
-/// Filtered frames at hand.
-constexpr std::int64_t room = 4096;
+/// Filtered samples at hand.
+constexpr std::int64_t room = 16384;
 
 /// What stays the same during one conversion.
 struct Conversion
@@ -56,13 +56,15 @@ void filter_frames(const Conversion& work, std::int64_t first,
 std::int64_t convert_some(const Conversion& work, std::int64_t first,
                           std::int64_t count, short* to)
 {
-    // One frame more than fits: the last one of all is held.
-    short filtered[2 * (room + 1)];
+    // One sample more than fits: the last one of all is held.
+    short filtered[room + 1];
+    const std::int64_t frames_at_hand =
+        room / static_cast<std::int64_t>(work.samples_a_frame);
     const std::int64_t place = first * work.down;
     const std::int64_t start = place / work.up;
     const SampleLanes::Steps steps = {place % work.up, work.down, work.up};
     const std::int64_t most =
-        ((room - 1) * work.up - 1 - steps.rest) / work.down + 1;
+        ((frames_at_hand - 1) * work.up - 1 - steps.rest) / work.down + 1;
     const std::int64_t made = std::min(count - first, most);
     const std::int64_t last =
         start + (steps.rest + (made - 1) * work.down) / work.up;

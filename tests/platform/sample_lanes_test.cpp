@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 #include <random>
+#include <string>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -16,7 +17,7 @@ using zt_platform::SampleLanes;
 
 constexpr short untouched = 0x1234;
 
-/// Each test runs with the plain lanes and with the fastest.
+/// Each test runs with the plain lanes and with all faster ones.
 class SampleLanesTest : public testing::TestWithParam<const SampleLanes*>
 {
 protected:
@@ -32,10 +33,19 @@ protected:
     }
 };
 
-INSTANTIATE_TEST_SUITE_P(Plain, SampleLanesTest,
-                         testing::Values(&SampleLanes::plain()));
-INSTANTIATE_TEST_SUITE_P(Fastest, SampleLanesTest,
-                         testing::Values(&SampleLanes::fastest()));
+/// Gives all that this processor can do, the plain ones first.
+std::vector<const SampleLanes*> All()
+{
+    std::vector<const SampleLanes*> all;
+    while (const SampleLanes* lanes = SampleLanes::numbered(all.size()))
+        all.push_back(lanes);
+    return all;
+}
+
+INSTANTIATE_TEST_SUITE_P(All, SampleLanesTest, testing::ValuesIn(All()),
+                         [](const auto& lanes) {
+                             return std::string(lanes.param->name());
+                         });
 
 TEST_P(SampleLanesTest, SamplesAreWeighedInPlaceAndElsewhere)
 {
@@ -167,6 +177,34 @@ TEST_P(SampleLanesTest, ALongSumCrossesExponentsToTheSameBits)
     }
 }
 
+TEST_P(SampleLanesTest, LongRunsOfStepsRepeatThemselves)
+{
+    for (auto [step, grid] :
+         {std::pair(147L, 160L), std::pair(80L, 441L), std::pair(1L, 1L),
+          std::pair(1L, 512L), std::pair(511L, 513L), std::pair(160L, 147L),
+          std::pair(4095L, 4096L), std::pair(4096L, 4097L)}) {
+        const SampleLanes::Steps steps = {grid / 3, step, grid};
+        const std::size_t count = 20000;
+        const auto last = static_cast<std::size_t>(
+            (steps.rest + static_cast<std::int64_t>(count - 1) * step) / grid);
+        const Samples samples = RandomSamples(2 * last + 4);
+        Samples between(count);
+        Samples plain_between(count);
+        Samples repeated(2 * count);
+        Samples plain_repeated(2 * count);
+
+        lanes.interpolate(samples.data(), between.data(), count, steps);
+        lanes.repeat(samples.data(), repeated.data(), count, steps);
+        SampleLanes::plain().interpolate(samples.data(), plain_between.data(),
+                                         count, steps);
+        SampleLanes::plain().repeat(samples.data(), plain_repeated.data(),
+                                    count, steps);
+
+        EXPECT_EQ(between, plain_between) << step << "/" << grid;
+        EXPECT_EQ(repeated, plain_repeated) << step << "/" << grid;
+    }
+}
+
 SampleLanes::Steps RandomSteps(std::mt19937& random)
 {
     static const std::int64_t grids[] = {1,   2,     147,       160,
@@ -249,6 +287,13 @@ TEST_P(SampleLanesTest, BytesAreWrittenTheMostSignificantFirst)
                       samples[i]);
         ASSERT_EQ(bytes.back(), 0xA5);
     }
+}
+
+TEST(SampleLanes, ThePlainOnesStandFirstAndTheFastestLast)
+{
+    EXPECT_EQ(All().front(), &SampleLanes::plain());
+    EXPECT_EQ(All().back(), &SampleLanes::fastest());
+    EXPECT_EQ(SampleLanes::numbered(1000), nullptr);
 }
 
 TEST(SampleLanes, TheFastestAreUsedUnlessOthersAreInstalled)

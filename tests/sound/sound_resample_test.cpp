@@ -74,9 +74,8 @@ TEST(sound_resample, RandomSoundsAreConvertedLikeLiteralOnesByEveryLane)
 {
     static const long rates[] = {1,     2,     7,     999,   8000,  11025,
                                  16000, 22050, 44100, 48000, 96000, 95999};
-    for (const SampleLanes* lanes :
-         {&SampleLanes::plain(), &SampleLanes::fastest()}) {
-        SampleLanes::install(lanes);
+    for (std::size_t number = 0; SampleLanes::numbered(number); ++number) {
+        SampleLanes::install(SampleLanes::numbered(number));
         std::mt19937 random(81);
         for (long rate : rates)
             for (long new_rate : rates)
@@ -100,9 +99,8 @@ TEST(sound_resample, RandomSoundsAreConvertedLikeLiteralOnesByEveryLane)
 
 TEST(sound_resample, LongSoundsAreConvertedLikeLiteralOnesByEveryLane)
 {
-    for (const SampleLanes* lanes :
-         {&SampleLanes::plain(), &SampleLanes::fastest()}) {
-        SampleLanes::install(lanes);
+    for (std::size_t number = 0; SampleLanes::numbered(number); ++number) {
+        SampleLanes::install(SampleLanes::numbered(number));
         std::mt19937 random(82);
         for (auto [rate, new_rate] :
              {std::pair(44100L, 48000L), std::pair(48000L, 44100L),

@@ -2,8 +2,11 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
-#include <bit>
+#include "platform/x86/sum_units.h"
+
+#include <algorithm>
 #include <immintrin.h>
+#include <numeric>
 
 // Every operation does whole blocks and leaves the rest to the plain one.
 // Loads and stores touch nothing outside what the plain one touches.
@@ -65,27 +68,6 @@ constexpr std::int64_t stride = 8; ///< The same, for places.
         _mm256_add_epi32(sums, _mm256_srli_epi32(sums, 31)), 1);
 }
 
-/// The sum of squares as a whole number of units in its last place.
-struct Units
-{
-    std::int32_t count; ///< 2^23 to 2^24 - 1.
-    int exponent;       ///< The unit is 2^(exponent - 23).
-};
-
-/// Requires: a normal number above 0.
-Units units_of(float sum)
-{
-    const std::uint32_t bits = std::bit_cast<std::uint32_t>(sum);
-    return {static_cast<std::int32_t>((bits & 0x7FFFFF) | 0x800000),
-            static_cast<int>(bits >> 23) - 127};
-}
-
-float power_of_two(int exponent)
-{
-    return std::bit_cast<float>(static_cast<std::uint32_t>(exponent + 127)
-                                << 23);
-}
-
 [[gnu::target("avx2")]] std::int32_t total_of(__m256i numbers)
 {
     __m128i sum = _mm_add_epi32(_mm256_castsi256_si128(numbers),
@@ -95,40 +77,51 @@ float power_of_two(int exponent)
     return _mm_cvtsi128_si32(sum);
 }
 
-/// Squares of samples that are added up as whole numbers.
-///
-/// While a sum in single precision keeps its exponent it is a whole number of
-/// units, and adding a square adds that square rounded to a unit: the order
-/// plays no part. Two things end this: a square half-way between two units,
-/// whose rounding depends on the sum, and a sum that gets the next exponent.
+/// Squares of samples, rounded to units of a sum.
 struct Squares
 {
-    static constexpr std::size_t count = 32;
+    static constexpr std::size_t count = 64;
 
-    bool are_plain;     ///< Whether no square is half-way or too large.
+    bool has_tie;       ///< Whether a square is half-way.
     std::int32_t total; ///< In units.
 };
 
-[[gnu::target("avx2")]] Squares squares_of(const short* samples,
-                                           float square_scale)
+/// Requires: squares of less than 2^24 units.
+[[gnu::target("avx2")]] Squares squares_of(const short* samples, __m256 scale)
 {
-    const __m256 scale = _mm256_set1_ps(square_scale);
-    const __m256 tie = _mm256_set1_ps(0.5f);
-    const __m256 largest = _mm256_set1_ps(16777216.0f);
+    const __m256 half_unit = _mm256_set1_ps(0.5f);
     const __m256 no_sign = _mm256_castsi256_ps(_mm256_set1_epi32(0x7FFFFFFF));
     __m256i total = _mm256_setzero_si256();
-    __m256 odd = _mm256_setzero_ps();
+    __m256 ties = _mm256_setzero_ps();
     for (std::size_t i = 0; i < Squares::count; i += half) {
         const __m256 value = numbers_at(samples + i);
         const __m256 square = _mm256_mul_ps(_mm256_mul_ps(value, value), scale);
         const __m256i units = _mm256_cvtps_epi32(square);
         const __m256 rest = _mm256_and_ps(
             _mm256_sub_ps(square, _mm256_cvtepi32_ps(units)), no_sign);
-        odd = _mm256_or_ps(odd, _mm256_cmp_ps(rest, tie, _CMP_EQ_OQ));
-        odd = _mm256_or_ps(odd, _mm256_cmp_ps(square, largest, _CMP_GE_OQ));
+        ties = _mm256_or_ps(ties, _mm256_cmp_ps(rest, half_unit, _CMP_EQ_OQ));
         total = _mm256_add_epi32(total, units);
     }
-    return {_mm256_movemask_ps(odd) == 0, total_of(total)};
+    return {_mm256_movemask_ps(ties) != 0, total_of(total)};
+}
+
+/// Adds up squares as long as the sum keeps its exponent and no square is
+/// half-way between two units.
+///
+/// Returns: how many samples were taken, whole blocks of them.
+[[gnu::target("avx2")]] std::size_t
+add_plain_squares(const short* samples, std::size_t count, float& sum)
+{
+    SumUnits units(sum);
+    const __m256 scale = _mm256_set1_ps(units.square_scale());
+    std::size_t at = 0;
+    for (; at + Squares::count <= count; at += Squares::count) {
+        const Squares squares = squares_of(samples + at, scale);
+        if (squares.has_tie || !units.add(squares.total))
+            break;
+    }
+    sum = units.sum();
+    return at;
 }
 
 /// The places of 8 outputs one after the other.
@@ -213,32 +206,21 @@ Rest after(const SampleLanes::Steps& steps, std::size_t outputs)
             {place % steps.grid, steps.step, steps.grid}};
 }
 
-/// Two neighbours for each of 8 outputs.
+[[gnu::target("avx2")]] void store_low_bits(short* to, __m256i numbers)
+{
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(to),
+                     _mm256_castsi256_si128(low_bits(numbers, numbers)));
+}
+
+/// Two neighbours for each of 8 outputs, wherever they are.
 struct Neighbours
 {
     __m256i here;
     __m256i next;
 };
 
-/// Reads neighbours that lie within 9 samples, as they do when there are more
-/// outputs than samples.
-[[gnu::target("avx2")]] Neighbours close_neighbours(const short* first,
-                                                    __m256i offsets)
-{
-    // Places of bytes: each offset twice as low and high byte of a sample.
-    const __m256i bytes =
-        _mm256_add_epi32(_mm256_mullo_epi16(offsets, _mm256_set1_epi32(0x0202)),
-                         _mm256_set1_epi32(0x0100));
-    const __m128i choice = _mm_packus_epi32(_mm256_castsi256_si128(bytes),
-                                            _mm256_extracti128_si256(bytes, 1));
-    return {
-        _mm256_cvtepi16_epi32(_mm_shuffle_epi8(load_half(first), choice)),
-        _mm256_cvtepi16_epi32(_mm_shuffle_epi8(load_half(first + 1), choice))};
-}
-
-/// Reads neighbours wherever they are.
-[[gnu::target("avx2")]] Neighbours far_neighbours(const short* samples,
-                                                  __m256i index)
+[[gnu::target("avx2")]] Neighbours neighbours_at(const short* samples,
+                                                 __m256i index)
 {
     const __m256i pairs = _mm256_i32gather_epi32(
         reinterpret_cast<const int*>(samples), index, sizeof(short));
@@ -246,170 +228,316 @@ struct Neighbours
             _mm256_srai_epi32(pairs, 16)};
 }
 
-[[gnu::target("avx2")]] __m256i between(const Neighbours& both,
-                                        __m256i remainder, __m256 grid)
+[[gnu::target("avx2")]] __m256i rise_between(__m256i here, __m256i next,
+                                             __m256 remainder, __m256 grid)
 {
-    const __m256 rise =
-        _mm256_div_ps(_mm256_mul_ps(_mm256_cvtepi32_ps(
-                                        _mm256_sub_epi32(both.next, both.here)),
-                                    _mm256_cvtepi32_ps(remainder)),
-                      grid);
-    return _mm256_add_epi32(both.here, _mm256_cvttps_epi32(rise));
+    const __m256 difference = _mm256_cvtepi32_ps(_mm256_sub_epi32(next, here));
+    return _mm256_cvttps_epi32(
+        _mm256_div_ps(_mm256_mul_ps(difference, remainder), grid));
 }
 
-[[gnu::target("avx2")]] void store_low_bits(short* to, __m256i numbers)
+/// Where 8 outputs lie that are no farther apart than samples: from a first
+/// one, and within the 8 from there on.
+struct Block
 {
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(to),
-                     _mm256_castsi256_si128(low_bits(numbers, numbers)));
-}
-
-class Avx2SampleLanes final : public SampleLanes
-{
-public:
-    const char* name() const override { return "avx2"; }
-
-    [[gnu::target("avx2")]] void weigh(const short* now, const short* before,
-                                       short* to, std::size_t count,
-                                       float now_factor,
-                                       float before_factor) const override
-    {
-        const __m256 of_now = _mm256_set1_ps(now_factor);
-        const __m256 of_before = _mm256_set1_ps(before_factor);
-        std::size_t left = count;
-        while (left >= block) {
-            const std::size_t at = left - block;
-            const __m256i first =
-                weigh_half(now + at, before + at, of_now, of_before);
-            const __m256i last = weigh_half(now + at + half, before + at + half,
-                                            of_now, of_before);
-            store(to + at, low_bits(first, last));
-            left = at;
-        }
-        SampleLanes::weigh(now, before, to, left, now_factor, before_factor);
-    }
-
-    [[gnu::target("avx2")]] void average(const short* pairs, short* averages,
-                                         std::size_t count) const override
-    {
-        std::size_t at = 0;
-        for (; at + block <= count; at += block)
-            store(averages + at,
-                  low_bits(average_half(pairs + 2 * at),
-                           average_half(pairs + 2 * (at + half))));
-        SampleLanes::average(pairs + 2 * at, averages + at, count - at);
-    }
-
-    [[gnu::target("avx2")]] Range range(const short* samples,
-                                        std::size_t count) const override
-    {
-        if (count < 2 * block)
-            return SampleLanes::range(samples, count);
-        __m256i least[2] = {load(samples), load(samples + block)};
-        __m256i largest[2] = {least[0], least[1]};
-        std::size_t at = 2 * block;
-        for (; at + 2 * block <= count; at += 2 * block)
-            for (std::size_t i = 0; i < 2; ++i) {
-                const __m256i here = load(samples + at + i * block);
-                least[i] = _mm256_min_epi16(least[i], here);
-                largest[i] = _mm256_max_epi16(largest[i], here);
-            }
-        const __m256i last = load(samples + count - block);
-        const __m256i rest = load(samples + count - 2 * block);
-        least[0] = _mm256_min_epi16(_mm256_min_epi16(least[0], least[1]),
-                                    _mm256_min_epi16(last, rest));
-        largest[0] = _mm256_max_epi16(_mm256_max_epi16(largest[0], largest[1]),
-                                      _mm256_max_epi16(last, rest));
-        short ends[2 * block];
-        store(ends, least[0]);
-        store(ends + block, largest[0]);
-        return SampleLanes::range(ends, 2 * block);
-    }
-
-    [[gnu::target("avx2")]] float sum_of_squares(const short* samples,
-                                                 std::size_t count,
-                                                 float sum) const override
-    {
-        std::size_t at = 0;
-        for (; at + Squares::count <= count; at += Squares::count) {
-            const Units units = units_of(sum);
-            const Squares squares = squares_of(
-                samples + at, power_of_two(23 - 30 - units.exponent));
-            if (sum > 0 && squares.are_plain &&
-                units.count + squares.total < 1 << 24)
-                sum = static_cast<float>(units.count + squares.total) *
-                      power_of_two(units.exponent - 23);
-            else
-                sum = SampleLanes::sum_of_squares(samples + at, Squares::count,
-                                                  sum);
-        }
-        return SampleLanes::sum_of_squares(samples + at, count - at, sum);
-    }
-
-    [[gnu::target("avx2")]] void interpolate(const short* samples, short* to,
-                                             std::size_t count,
-                                             const Steps& steps) const override
-    {
-        std::size_t at = 0;
-        if (count >= half && PlaceLanes::can_do(steps)) {
-            const __m256 grid = _mm256_set1_ps(static_cast<float>(steps.grid));
-            const bool close = steps.step <= steps.grid;
-            const int last = static_cast<int>(after(steps, count - 1).index);
-            PlaceLanes lanes(steps);
-            for (; at + half <= count; at += half, lanes.advance()) {
-                // Close neighbours are read 9 samples at a time.
-                if (close && lanes.first_index() + 8 > last + 1)
-                    break;
-                const Places& places = lanes.places();
-                const int first = lanes.first_index();
-                const Neighbours both =
-                    close ? close_neighbours(
-                                samples + first,
-                                _mm256_sub_epi32(places.index,
-                                                 _mm256_set1_epi32(first)))
-                          : far_neighbours(samples, places.index);
-                store_low_bits(to + at, between(both, places.remainder, grid));
-            }
-        }
-        const Rest rest = after(steps, at);
-        SampleLanes::interpolate(samples + rest.index, to + at, count - at,
-                                 rest.steps);
-    }
-
-    [[gnu::target("avx2")]] void repeat(const short* frames, short* to,
-                                        std::size_t count,
-                                        const Steps& steps) const override
-    {
-        std::size_t at = 0;
-        if (PlaceLanes::can_do(steps)) {
-            PlaceLanes lanes(steps);
-            for (; at + half <= count; at += half, lanes.advance())
-                store(to + 2 * at,
-                      _mm256_i32gather_epi32(
-                          reinterpret_cast<const int*>(frames),
-                          lanes.places().index, 2 * sizeof(short)));
-        }
-        const Rest rest = after(steps, at);
-        SampleLanes::repeat(frames + 2 * rest.index, to + 2 * at, count - at,
-                            rest.steps);
-    }
-
-    [[gnu::target("avx2")]] void to_big_bytes(const short* samples,
-                                              unsigned char* bytes,
-                                              std::size_t count) const override
-    {
-        std::size_t at = 0;
-        for (; at + block <= count; at += block) {
-            const __m256i here = load(samples + at);
-            store(bytes + 2 * at, _mm256_or_si256(_mm256_slli_epi16(here, 8),
-                                                  _mm256_srli_epi16(here, 8)));
-        }
-        SampleLanes::to_big_bytes(samples + at, bytes + 2 * at, count - at);
-    }
+    __m256i offsets; ///< From the first one.
+    __m128i choice;  ///< The same as pairs of bytes, to shuffle by.
+    __m256 remainders;
+    std::ptrdiff_t first;
 };
 
-constinit const Avx2SampleLanes avx2_lanes;
+/// The blocks of a run of steps that begins anew when grid and blocks meet.
+class Period
+{
+public:
+    /// Tells whether steps are short and repeat soon enough.
+    static bool can_do(const SampleLanes::Steps& steps)
+    {
+        return PlaceLanes::can_do(steps) && steps.step <= steps.grid &&
+               blocks_of(steps) <= static_cast<std::int64_t>(most_blocks);
+    }
+
+    /// Makes the blocks that `outputs` need.
+    [[gnu::target("avx2")]] Period(const SampleLanes::Steps& steps,
+                                   std::size_t outputs)
+        : period(blocks_of(steps) * stride * steps.step / steps.grid),
+          block_count(static_cast<std::size_t>(blocks_of(steps)))
+    {
+        PlaceLanes lanes(steps);
+        const std::size_t needed = std::min(block_count, outputs / half);
+        for (std::size_t i = 0; i < needed; ++i, lanes.advance()) {
+            const int first = lanes.first_index();
+            blocks[i].first = first;
+            blocks[i].offsets = _mm256_sub_epi32(lanes.places().index,
+                                                 _mm256_set1_epi32(first));
+            blocks[i].choice = bytes_of(blocks[i].offsets);
+            blocks[i].remainders = _mm256_cvtepi32_ps(lanes.places().remainder);
+        }
+    }
+
+    /// A block after the other. It is kept apart from the blocks so that it
+    /// can stay in registers while outputs are stored.
+    class Cursor
+    {
+    public:
+        explicit Cursor(const Period& whole_period)
+            : period(whole_period.period), begin(whole_period.blocks),
+              end(begin + whole_period.block_count), now(begin), start(0)
+        {}
+
+        const Block& block() const { return *now; }
+
+        /// Gives the first sample of the block.
+        std::ptrdiff_t first() const { return start + now->first; }
+
+        void advance()
+        {
+            if (++now == end) {
+                now = begin;
+                start += period;
+            }
+        }
+
+    private:
+        std::ptrdiff_t period;
+        const Block* begin;
+        const Block* end;
+        const Block* now;
+        std::ptrdiff_t start; ///< Of the run.
+    };
+
+private:
+    static constexpr std::size_t most_blocks = 512;
+
+    static std::int64_t blocks_of(const SampleLanes::Steps& steps)
+    {
+        return steps.grid / std::gcd(steps.grid, stride);
+    }
+
+    /// Gives the places of the bytes of samples.
+    [[gnu::target("avx2")]] static __m128i bytes_of(__m256i offsets)
+    {
+        const __m256i bytes = _mm256_add_epi32(
+            _mm256_mullo_epi16(offsets, _mm256_set1_epi32(0x0202)),
+            _mm256_set1_epi32(0x0100));
+        return _mm_packus_epi32(_mm256_castsi256_si128(bytes),
+                                _mm256_extracti128_si256(bytes, 1));
+    }
+
+    std::ptrdiff_t period; ///< Samples from one run to the next.
+    std::size_t block_count;
+    Block blocks[most_blocks];
+};
+
+/// Makes outputs that lie close together, by shuffling what a block has.
+///
+/// Returns: how many were made.
+[[gnu::target("avx2")]] std::size_t
+interpolate_close(const short* samples, short* to, std::size_t count,
+                  const SampleLanes::Steps& steps, std::ptrdiff_t last)
+{
+    const __m256 grid = _mm256_set1_ps(static_cast<float>(steps.grid));
+    const __m128i low = _mm_set1_epi32(0xFFFF);
+    const Period period(steps, count);
+    Period::Cursor cursor(period);
+    std::size_t at = 0;
+    // A block reads 9 samples, the last place has one behind it.
+    for (; at + half <= count && cursor.first() + 8 <= last + 1;
+         at += half, cursor.advance()) {
+        const Block& places = cursor.block();
+        const short* from = samples + cursor.first();
+        const __m128i here = _mm_shuffle_epi8(load_half(from), places.choice);
+        const __m128i next =
+            _mm_shuffle_epi8(load_half(from + 1), places.choice);
+        const __m256i rise =
+            rise_between(_mm256_cvtepi16_epi32(here),
+                         _mm256_cvtepi16_epi32(next), places.remainders, grid);
+        const __m128i rise_bits = _mm_packus_epi32(
+            _mm_and_si128(_mm256_castsi256_si128(rise), low),
+            _mm_and_si128(_mm256_extracti128_si256(rise, 1), low));
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(to + at),
+                         _mm_add_epi16(here, rise_bits));
+    }
+    return at;
+}
+
+/// Makes frames that lie close together likewise.
+[[gnu::target("avx2")]] std::size_t
+repeat_close(const short* frames, short* to, std::size_t count,
+             const SampleLanes::Steps& steps, std::ptrdiff_t last)
+{
+    const Period period(steps, count);
+    Period::Cursor cursor(period);
+    std::size_t at = 0;
+    for (; at + half <= count && cursor.first() + 7 <= last;
+         at += half, cursor.advance())
+        store(to + 2 * at,
+              _mm256_permutevar8x32_epi32(load(frames + 2 * cursor.first()),
+                                          cursor.block().offsets));
+    return at;
+}
+
+/// Makes outputs that lie anywhere, by fetching each.
+[[gnu::target("avx2")]] std::size_t
+interpolate_anywhere(const short* samples, short* to, std::size_t count,
+                     const SampleLanes::Steps& steps)
+{
+    const __m256 grid = _mm256_set1_ps(static_cast<float>(steps.grid));
+    PlaceLanes lanes(steps);
+    std::size_t at = 0;
+    for (; at + half <= count; at += half, lanes.advance()) {
+        const Neighbours both = neighbours_at(samples, lanes.places().index);
+        const __m256i rise =
+            rise_between(both.here, both.next,
+                         _mm256_cvtepi32_ps(lanes.places().remainder), grid);
+        store_low_bits(to + at, _mm256_add_epi32(both.here, rise));
+    }
+    return at;
+}
+
+[[gnu::target("avx2")]] std::size_t
+repeat_anywhere(const short* frames, short* to, std::size_t count,
+                const SampleLanes::Steps& steps)
+{
+    PlaceLanes lanes(steps);
+    std::size_t at = 0;
+    for (; at + half <= count; at += half, lanes.advance())
+        store(to + 2 * at,
+              _mm256_i32gather_epi32(reinterpret_cast<const int*>(frames),
+                                     lanes.places().index, 2 * sizeof(short)));
+    return at;
+}
+
+/// Gives the whole part of the last place.
+std::ptrdiff_t last_place(const SampleLanes::Steps& steps, std::size_t count)
+{
+    return static_cast<std::ptrdiff_t>(after(steps, count - 1).index);
+}
+
+struct InstalledLanes final : Avx2SampleLanes
+{};
+
+constinit const InstalledLanes avx2_lanes;
 
 } // namespace
+
+const char* Avx2SampleLanes::name() const
+{
+    return "avx2";
+}
+
+[[gnu::target("avx2")]] void
+Avx2SampleLanes::weigh(const short* now, const short* before, short* to,
+                       std::size_t count, float now_factor,
+                       float before_factor) const
+{
+    const __m256 of_now = _mm256_set1_ps(now_factor);
+    const __m256 of_before = _mm256_set1_ps(before_factor);
+    std::size_t left = count;
+    while (left >= block) {
+        const std::size_t at = left - block;
+        const __m256i first =
+            weigh_half(now + at, before + at, of_now, of_before);
+        const __m256i last =
+            weigh_half(now + at + half, before + at + half, of_now, of_before);
+        store(to + at, low_bits(first, last));
+        left = at;
+    }
+    SampleLanes::weigh(now, before, to, left, now_factor, before_factor);
+}
+
+[[gnu::target("avx2")]] void Avx2SampleLanes::average(const short* pairs,
+                                                      short* averages,
+                                                      std::size_t count) const
+{
+    std::size_t at = 0;
+    for (; at + block <= count; at += block)
+        store(averages + at, low_bits(average_half(pairs + 2 * at),
+                                      average_half(pairs + 2 * (at + half))));
+    SampleLanes::average(pairs + 2 * at, averages + at, count - at);
+}
+
+[[gnu::target("avx2")]] SampleLanes::Range
+Avx2SampleLanes::range(const short* samples, std::size_t count) const
+{
+    constexpr std::size_t lanes = 4;
+    if (count < lanes * block)
+        return SampleLanes::range(samples, count);
+    __m256i least[lanes];
+    __m256i largest[lanes];
+    for (std::size_t i = 0; i < lanes; ++i)
+        least[i] = largest[i] = load(samples + i * block);
+    std::size_t at = lanes * block;
+    for (; at + lanes * block <= count; at += lanes * block)
+        for (std::size_t i = 0; i < lanes; ++i) {
+            const __m256i here = load(samples + at + i * block);
+            least[i] = _mm256_min_epi16(least[i], here);
+            largest[i] = _mm256_max_epi16(largest[i], here);
+        }
+    // The last blocks once more, now up to the end.
+    short ends[2 * lanes * block];
+    for (std::size_t i = 0; i < lanes; ++i) {
+        const __m256i last = load(samples + count - (i + 1) * block);
+        store(ends + 2 * i * block, _mm256_min_epi16(least[i], last));
+        store(ends + (2 * i + 1) * block, _mm256_max_epi16(largest[i], last));
+    }
+    return SampleLanes::range(ends, 2 * lanes * block);
+}
+
+[[gnu::target("avx2")]] float
+Avx2SampleLanes::sum_of_squares(const short* samples, std::size_t count,
+                                float sum) const
+{
+    std::size_t at = 0;
+    while (count - at >= Squares::count) {
+        if (sum >= SumUnits::least_sum)
+            at += add_plain_squares(samples + at, count - at, sum);
+        const std::size_t next = std::min(Squares::count, count - at);
+        sum = SampleLanes::sum_of_squares(samples + at, next, sum);
+        at += next;
+    }
+    return SampleLanes::sum_of_squares(samples + at, count - at, sum);
+}
+
+void Avx2SampleLanes::interpolate(const short* samples, short* to,
+                                  std::size_t count, const Steps& steps) const
+{
+    std::size_t at = 0;
+    if (count >= half && Period::can_do(steps))
+        at = interpolate_close(samples, to, count, steps,
+                               last_place(steps, count));
+    else if (PlaceLanes::can_do(steps))
+        at = interpolate_anywhere(samples, to, count, steps);
+    const Rest rest = after(steps, at);
+    SampleLanes::interpolate(samples + rest.index, to + at, count - at,
+                             rest.steps);
+}
+
+void Avx2SampleLanes::repeat(const short* frames, short* to, std::size_t count,
+                             const Steps& steps) const
+{
+    std::size_t at = 0;
+    if (count >= half && Period::can_do(steps))
+        at = repeat_close(frames, to, count, steps, last_place(steps, count));
+    else if (PlaceLanes::can_do(steps))
+        at = repeat_anywhere(frames, to, count, steps);
+    const Rest rest = after(steps, at);
+    SampleLanes::repeat(frames + 2 * rest.index, to + 2 * at, count - at,
+                        rest.steps);
+}
+
+[[gnu::target("avx2")]] void
+Avx2SampleLanes::to_big_bytes(const short* samples, unsigned char* bytes,
+                              std::size_t count) const
+{
+    std::size_t at = 0;
+    for (; at + block <= count; at += block) {
+        const __m256i here = load(samples + at);
+        store(bytes + 2 * at, _mm256_or_si256(_mm256_slli_epi16(here, 8),
+                                              _mm256_srli_epi16(here, 8)));
+    }
+    SampleLanes::to_big_bytes(samples + at, bytes + 2 * at, count - at);
+}
 
 const SampleLanes* avx2_sample_lanes()
 {
