@@ -288,13 +288,16 @@ void KvoSound::Stereo(const KvoSound* other)
     short* both = zt_sound::new_samples(frames, 2);
     if (!both)
         return;
-    const KvoSound& right = other ? *other : *this;
     const std::size_t count = zt_sound::frames_of(*this);
-    const std::size_t there =
-        right.samples ? std::min(count, zt_sound::samples_of(right)) : 0;
+    const short* right = samples;
+    std::size_t there = count;
+    if (other) {
+        right = other->samples;
+        there = right ? std::min(count, zt_sound::samples_of(*other)) : 0;
+    }
     for (std::size_t i = 0; i < count; ++i) {
         both[2 * i] = samples[i];
-        both[2 * i + 1] = i < there ? right.samples[i] : short{0};
+        both[2 * i + 1] = i < there ? right[i] : short{0};
     }
     zt_sound::replace_samples(*this, both, frames);
     channels = 2;

@@ -241,8 +241,8 @@ struct Neighbours
 struct Block
 {
     __m256i offsets; ///< From the first one.
-    __m128i choice;  ///< The same as pairs of bytes, to shuffle by.
     __m256 remainders;
+    __m128i choice; ///< The offsets as pairs of bytes, to shuffle by.
     std::ptrdiff_t first;
 };
 

@@ -9,9 +9,11 @@
 #include <algorithm>
 #include <immintrin.h>
 
+#if !defined(__clang__)
 // g++ 12 takes the undefined registers of its own header for faults.
 #pragma GCC diagnostic ignored "-Wmaybe-uninitialized"
 #pragma GCC diagnostic ignored "-Wuninitialized"
+#endif
 
 namespace zt_platform {
 
@@ -149,7 +151,8 @@ public:
                                 _mm512_cvtepi32_epi16(sums));
             left = at;
         }
-        SampleLanes::weigh(now, before, to, left, now_factor, before_factor);
+        Avx2SampleLanes::weigh(now, before, to, left, now_factor,
+                               before_factor);
     }
 
     [[gnu::target("avx512f,avx512bw")]] Range
@@ -189,10 +192,10 @@ public:
             if (sum >= SumUnits::least_sum)
                 at += add_plain_squares(samples + at, count - at, sum);
             const std::size_t next = std::min(Squares::count, count - at);
-            sum = SampleLanes::sum_of_squares(samples + at, next, sum);
+            sum = Avx2SampleLanes::sum_of_squares(samples + at, next, sum);
             at += next;
         }
-        return SampleLanes::sum_of_squares(samples + at, count - at, sum);
+        return Avx2SampleLanes::sum_of_squares(samples + at, count - at, sum);
     }
 };
 

@@ -126,7 +126,8 @@ void DrawSpectrum(const KvoSound& sound, ZtImageSGI& picture)
                                              static_cast<double>(power.size()));
     }
     for (int x = 0; x < picture.width; ++x) {
-        const auto from = power.begin() + x * in_column;
+        const auto from =
+            power.begin() + static_cast<std::ptrdiff_t>(x) * in_column;
         const double loudest = *std::max_element(from, from + in_column) /
                                static_cast<double>(windows);
         const double decibels = 10 * std::log10(std::max(loudest, 1e-20));

@@ -1,0 +1,22 @@
+// Reads any bytes as a sound file, uses what comes of it in every way, and
+// stops where what was saved does not load as what it was.
+
+#include <cstddef>
+#include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+#include <string>
+
+#include "sound/sound_difference.h"
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data,
+                                      std::size_t size)
+{
+    const std::string file(reinterpret_cast<const char*>(data), size);
+    const std::string difference = SoundDifferenceOn(file);
+    if (!difference.empty()) {
+        std::fprintf(stderr, "%s", difference.c_str());
+        std::abort();
+    }
+    return 0;
+}
