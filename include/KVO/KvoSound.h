@@ -103,7 +103,8 @@ public:
     void Save(const char* filename) const;
 
     /// Sets `min` and `max` to the smallest and the largest sample of both
-    /// channels, to 0 without a buffer.
+    /// channels, to 0 without a buffer. A count other than 1 is taken for 2,
+    /// without a report.
     void ComputeMinMax();
 
     /// Gives the root mean square of all samples, each divided by 32768.

@@ -322,6 +322,18 @@ TEST(KvoSound, MinAndMaxStartAtTheFirstSample)
     EXPECT_EQ(above.max, 9);
 }
 
+TEST(KvoSound, MinAndMaxOfOtherCountsAreThoseOfTwoSamplesAFrame)
+{
+    const ErrorTrap reports;
+    KvoSound sound = ThreeChannels();
+
+    sound.ComputeMinMax();
+
+    EXPECT_EQ(sound.min, 1);
+    EXPECT_EQ(sound.max, 4);
+    EXPECT_EQ(reports.Text(), "");
+}
+
 TEST(KvoSound, VolumeIsTheRootMeanSquare)
 {
     EXPECT_FLOAT_EQ(MonoSound({-32768, -32768}).Volume(), 1.0f);
