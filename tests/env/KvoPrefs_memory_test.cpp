@@ -15,14 +15,14 @@
 TEST(KvoPrefsTexts, ASettingMayBeSetToItself)
 {
     KvoPrefs::SetProject("shot1");
-    KvoPrefs::SetWorkEnv("/work");
+    KvoPrefs::SetWorkEnv("/show");
     KvoPrefs::SetVariable("SELF", "value");
 
     KvoPrefs::SetProject(KvoPrefs::Project() + 1);
     KvoPrefs::SetWorkEnv(KvoPrefs::WorkEnv());
     KvoPrefs::SetVariable("SELF", KvoPrefs::Variable("SELF", "") + 2);
 
-    EXPECT_STREQ(KvoPrefs::ProjectDir(), "/work/user_data/hot1");
+    EXPECT_STREQ(KvoPrefs::ProjectDir(), "/show/user_data/hot1");
     EXPECT_STREQ(KvoPrefs::Variable("SELF", ""), "lue");
 }
 
@@ -103,7 +103,7 @@ TEST(KvoPrefsTable, IsOrderedByNameAndHoldsEachOnce)
 TEST(KvoPrefsMemory, WithoutMemorySettingsStayAsTheyAre)
 {
     KvoPrefs::SetProject("shot1");
-    KvoPrefs::SetWorkEnv("/work");
+    KvoPrefs::SetWorkEnv("/show");
     KvoPrefs::SetVariable("KEPT", "value");
     {
         FailingMemory none;
@@ -114,7 +114,7 @@ TEST(KvoPrefsMemory, WithoutMemorySettingsStayAsTheyAre)
         KvoPrefs::SetVariable("NEVER_MADE", "value");
     }
 
-    EXPECT_STREQ(KvoPrefs::ProjectDir(), "/work/user_data/shot1");
+    EXPECT_STREQ(KvoPrefs::ProjectDir(), "/show/user_data/shot1");
     for (const auto setting :
          {KvoPrefs::Setting::Project, KvoPrefs::Setting::WorkEnv})
         EXPECT_EQ(KvoPrefs::OriginOf(setting), KvoPrefs::Origin::SetHere);

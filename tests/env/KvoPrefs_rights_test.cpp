@@ -20,7 +20,7 @@ public:
         raised_rights = true;
         programs = {"/evil/bin/get_quarn_variable", "get_quarn_variable"};
         setenv("QUARN_LOCATION", "/evil", 1);
-        setenv("QUARN_WORKENV", "/work", 1);
+        setenv("QUARN_WORKENV", "/show", 1);
         setenv("PATH", "", 1);
     }
 };
@@ -40,5 +40,5 @@ TEST(KvoPrefsRights, RaisedRightsLeaveOutTheLocationAndTheQueryProgram)
 
 TEST(KvoPrefsRights, RaisedRightsLeaveTheOtherSettings)
 {
-    EXPECT_STREQ(KvoPrefs::ProjectDir(), "/work/user_data/demo");
+    EXPECT_STREQ(KvoPrefs::ProjectDir(), "/show/user_data/demo");
 }

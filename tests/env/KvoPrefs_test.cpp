@@ -13,17 +13,17 @@ TEST(KvoPrefs, DirectoriesAreBuiltOfWorkEnvironmentProjectAndVariable)
 {
     Installation installation;
     installation.Knows({"QUARN_WIRE_DIR wire"});
-    installation.Set("QUARN_WORKENV=/work");
+    installation.Set("QUARN_WORKENV=/show");
     installation.Set("QUARN_PROJECT=shot1");
 
-    EXPECT_EQ(installation.Ask({"wire"}), Lines{"/work/user_data/shot1/wire"});
+    EXPECT_EQ(installation.Ask({"wire"}), Lines{"/show/user_data/shot1/wire"});
 }
 
 TEST(KvoPrefs, AnAbsoluteProjectIsItsOwnDirectory)
 {
     Installation installation;
     installation.Knows({"QUARN_WIRE_DIR wire"});
-    installation.Set("QUARN_WORKENV=/work");
+    installation.Set("QUARN_WORKENV=/show");
     installation.Set("QUARN_PROJECT=/proj/x");
 
     EXPECT_EQ(installation.Ask({"wire", "project-dir"}),
@@ -42,11 +42,11 @@ TEST(KvoPrefs, AVariableThatNobodyKnowsGivesTheProjectsDirectoryAndASlash)
 {
     Installation installation;
     installation.Knows({});
-    installation.Set("QUARN_WORKENV=/work");
+    installation.Set("QUARN_WORKENV=/show");
     installation.Set("QUARN_PROJECT=shot1");
 
     EXPECT_EQ(installation.Ask({"stage", "wire"}),
-              (Lines{"/work/user_data/shot1/", "/work/user_data/shot1/"}));
+              (Lines{"/show/user_data/shot1/", "/show/user_data/shot1/"}));
 }
 
 TEST(KvoPrefs, TheWorkEnvironmentIsTheCurrentDirectoryUnlessItIsNamed)
@@ -331,12 +331,12 @@ TEST(KvoPrefs, OtherStaticObjectsMayAskBeforeTheSettingsAreRead)
 TEST(KvoPrefs, WhatOtherStaticObjectsSetBeforeTheSettingsAreReadStays)
 {
     for (const auto& [what, directory] : std::vector<std::pair<Lines, Lines>>{
-             {{"project"}, {"/work/user_data/early/wire"}},
+             {{"project"}, {"/show/user_data/early/wire"}},
              {{"workenv"}, {"early/user_data/shot1/wire"}},
-             {{"variable"}, {"/work/user_data/shot1/early"}}}) {
+             {{"variable"}, {"/show/user_data/shot1/early"}}}) {
         Installation installation;
         installation.Knows({"QUARN_WIRE_DIR wire"});
-        installation.Set("QUARN_WORKENV=/work");
+        installation.Set("QUARN_WORKENV=/show");
         installation.Set("QUARN_PROJECT=shot1");
         installation.Set("PROBE_SETS_FIRST=" + what[0]);
 

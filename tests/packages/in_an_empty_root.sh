@@ -35,19 +35,19 @@ for tool in $(dpkg -L zt-util2-tools | sed -n 's|^/usr/bin/||p'); do
 done
 
 # Of the checkout only the tests: what is used is what was installed.
-mkdir /work /work/build
-cp -a /src/tests /work/tests
+mkdir /trial /trial/build
+cp -a /src/tests /trial/tests
 for way in find_package pkg_config; do
-    python3 /work/tests/consumer/consumer_test.py $way /work /work/build \
+    python3 /trial/tests/consumer/consumer_test.py $way /trial /trial/build \
         c++ "$libdir" --installed
 done
 
 say "a plug-in"
-cd /work
+cd /trial
 ztsh plugin new Outside >/dev/null
 cmake -G Ninja -S Outside -B build/Outside >>$log
 cmake --build build/Outside >>$log
-ctest --test-dir build/Outside >/work/said || { cat /work/said; exit 1; }
+ctest --test-dir build/Outside >/trial/said || { cat /trial/said; exit 1; }
 [ "$(ztsh -c 'LoadPlugins build/Outside; Outside there' 2>&1 |
     tail -n 1)" = "Outside says hello to there" ]
 ztsh -c 'LoadPlugins; Plugins' | grep -q edge
@@ -55,19 +55,19 @@ ztsh -c 'LoadPlugins; Plugins' | grep -q edge
 say "the examples"
 for source in "$documents"/examples/*.cpp; do
     name=$(basename "$source" .cpp)
-    g++ -std=c++20 "$source" -o "/work/$name" \
+    g++ -std=c++20 "$source" -o "/trial/$name" \
         $(pkg-config --cflags --libs zt_util2)
-    python3 /work/tests/shell/run_case.py "/work/$name" "$documents" \
-        "/work/tests/examples/$name.case" >/work/said ||
-        { echo "$name:"; cat /work/said; exit 1; }
+    python3 /trial/tests/shell/run_case.py "/trial/$name" "$documents" \
+        "/trial/tests/examples/$name.case" >/trial/said ||
+        { echo "$name:"; cat /trial/said; exit 1; }
 done
-for case in /work/tests/shell/cases/example_*.case \
-            /work/tests/shell/cases/realtime_countdown.case; do
-    python3 /work/tests/shell/run_case.py /usr/bin/ztsh "$documents" "$case" \
-        edge="$(pkg-config --variable=plugindir zt_util2)" >/work/said || { echo "$case:"; cat /work/said; exit 1; }
+for case in /trial/tests/shell/cases/example_*.case \
+            /trial/tests/shell/cases/realtime_countdown.case; do
+    python3 /trial/tests/shell/run_case.py /usr/bin/ztsh "$documents" "$case" \
+        edge="$(pkg-config --variable=plugindir zt_util2)" >/trial/said || { echo "$case:"; cat /trial/said; exit 1; }
 done
-cd /work
-ztsh "$documents/examples/tour.zt" >/dev/null 2>/work/said
+cd /trial
+ztsh "$documents/examples/tour.zt" >/dev/null 2>/trial/said
 test -s ztsh-tour/smooth.png
 
 say "taking them off again"
@@ -77,6 +77,6 @@ left=$(find /usr -name '*zt_util2*' -o -name '*ztsh*' -o -name '*zt-util2*')
 
 say "a host that builds the library itself"
 /src/scripts/setup
-python3 /src/tests/consumer/consumer_test.py add_subdirectory /src /work/build \
+python3 /src/tests/consumer/consumer_test.py add_subdirectory /src /trial/build \
     c++ "$libdir"
 say "all well"

@@ -375,30 +375,6 @@ TEST(RealBeatDeath, AProcessThatExitsWithoutStopEndsCleanly)
             testing::ExitedWithCode(7), "");
 }
 
-// In a process of its own: what was to be done at the exit before the beat was
-// started is done after the beat was silenced.
-TEST(RealBeatDeath, AtTheExitTheAlarmIsDisarmedAndIgnored)
-{
-    GTEST_FLAG_SET(death_test_style, "threadsafe");
-    EXPECT_EXIT(
-        {
-            std::atexit([] {
-                itimerval left = {};
-                getitimer(ITIMER_REAL, &left);
-                struct sigaction now = {};
-                sigaction(SIGALRM, nullptr, &now);
-                const bool silent = left.it_value.tv_sec == 0 &&
-                                    left.it_value.tv_usec == 0 &&
-                                    now.sa_handler == SIG_IGN;
-                _exit(silent ? 7 : 8);
-            });
-            ZtTimerBeat::sample_rate = 60000000;
-            ZtTimerBeat::start();
-            std::exit(0);
-        },
-        testing::ExitedWithCode(7), "");
-}
-
 TEST(RealBeatDeath, AProcessThatExitsInABlockEndsCleanly)
 {
     EXPECT_EXIT(
