@@ -2,6 +2,8 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
+#include "platform/x86/processor.h"
+
 #include <bit>
 #include <immintrin.h>
 
@@ -317,8 +319,7 @@ constinit const Avx2PixelLanes avx2_lanes;
 
 const PixelLanes* avx2_pixel_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    return __builtin_cpu_supports("avx2") ? &avx2_lanes : nullptr;
+    return processor_has_avx2() ? &avx2_lanes : nullptr;
 }
 
 } // namespace zt_platform

@@ -4,6 +4,7 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
+#include "platform/x86/processor.h"
 #include "platform/x86/sum_units.h"
 
 #include <algorithm>
@@ -205,11 +206,8 @@ constinit const Avx512SampleLanes avx512_lanes;
 
 const SampleLanes* avx512_sample_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    return __builtin_cpu_supports("avx512f") &&
-                   __builtin_cpu_supports("avx512bw") && avx2_sample_lanes()
-               ? &avx512_lanes
-               : nullptr;
+    return processor_has_avx512() && avx2_sample_lanes() ? &avx512_lanes
+                                                         : nullptr;
 }
 
 } // namespace zt_platform
