@@ -274,6 +274,47 @@ TEST_F(SoundControl, ASoundWithoutABufferIsPlayedAsNothing)
     EXPECT_EQ(reports.Text(), "");
 }
 
+TEST_F(SoundControl, ASoundOfNoRateIsNotWaitedFor)
+{
+    for (const long rate : {0L, -8000L, -9223372036854775807L - 1}) {
+        KvoSound sound = MonoSound(Ramp(10), rate);
+
+        Control::Play(&sound);
+
+        EXPECT_TRUE(device.blocks.empty()) << rate;
+        EXPECT_EQ(device.open_ports, 0);
+    }
+    EXPECT_EQ(device.opens.size(), 3U);
+    EXPECT_EQ(reports.Text(), "");
+}
+
+TEST_F(SoundControl, PlaybackRequestedInsideTheBeatFindsNoPort)
+{
+    static KvoSound sound = MonoSound(Ramp(10));
+    static float position = 0;
+    ZtTimer timer;
+    // Errors are made ready by a request from outside.
+    ZtTimer later;
+    for (int request = 0; request < 3; ++request)
+        Control::Play(&sound, &later, KvoTime());
+
+    timer.post_trigger(
+        [](ZtTimer* its_timer, void*) {
+            Control::Play(&sound);
+            Control::Play(&sound, its_timer, KvoTime());
+            Control::PlayDrag(&sound, its_timer, 100, &position);
+        },
+        nullptr, KvoTime());
+    Start(timer);
+    Beats(3);
+
+    const std::string one =
+        "Error: Failed to open an audio port for writing.\n";
+    EXPECT_EQ(reports.Text(), one + one + one);
+    EXPECT_TRUE(device.opens.empty());
+    EXPECT_EQ(timer.stop_callbacks, nullptr);
+}
+
 TEST_F(SoundControl, WithoutADevicePlayReportsAndPlaysNothing)
 {
     KvoSound sound = MonoSound(Ramp(10));

@@ -240,6 +240,24 @@ TEST(sound_edit, AnEndlessSpanChangesNothing)
     EXPECT_EQ(SamplesOf(sound), (Samples{1, 2, 3}));
 }
 
+TEST(sound_edit, TimesAtTheGreatestRatesDoNotOverflow)
+{
+    constexpr long greatest = 9223372036854775807;
+    KvoSound trimmed = MonoSound({1, 2, 3}, greatest);
+    KvoSound lowest = MonoSound({1, 2, 3}, -greatest - 1);
+    KvoSound pasted = MonoSound({1, 2, 3}, greatest);
+    KvoSound other = MonoSound({7}, greatest);
+
+    trimmed.Trim(Seconds(0), Seconds(1));
+    lowest.Trim(Seconds(-1), Seconds(0));
+    pasted.Insert(&other, KvoTime::FOREVER);
+
+    EXPECT_EQ(SamplesOf(trimmed), (Samples{1, 2, 3}));
+    EXPECT_EQ(lowest.samples, nullptr); // its times run backward
+    EXPECT_EQ(SamplesOf(pasted), (Samples{1, 2, 3}));
+    EXPECT_EQ(trimmed.Extract(Seconds(1), Seconds(2)), nullptr);
+}
+
 // --- insert
 // --------------------------------------------------------------------
 
