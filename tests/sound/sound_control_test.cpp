@@ -195,12 +195,26 @@ TEST_F(SoundControl, PlaySleepsTenClockTicksAtATime)
 
 TEST_F(SoundControl, PlayWaitsUntilHalfOfTheQueueIsFree)
 {
+    struct CountingClock : FakeClock
+    {
+        explicit CountingClock(FakeAudioDevice& its_device) : audio(its_device)
+        {}
+        void sleep_nanoseconds(std::uint64_t nanoseconds) override
+        {
+            FakeClock::sleep_nanoseconds(nanoseconds);
+            sleeps_after_six += audio.blocks.size() == 6;
+        }
+        FakeAudioDevice& audio;
+        int sleeps_after_six = 0;
+    } counting(device);
     KvoSound sound = MonoSound(Ramp(70000), 1000);
 
     Control::Play(&sound);
 
-    // Six blocks fit before the seventh has to wait for 10000 samples.
+    // Six blocks fit before the seventh has to wait for 10000 samples, which
+    // take ten seconds.
     EXPECT_EQ(device.blocks, std::vector<long>(7, 10000));
+    EXPECT_EQ(counting.sleeps_after_six, 100);
     EXPECT_EQ(device.played, Ramp(70000));
 }
 
