@@ -202,10 +202,10 @@ TEST_F(SoundControl, PlayWaitsUntilHalfOfTheQueueIsFree)
         void sleep_nanoseconds(std::uint64_t nanoseconds) override
         {
             FakeClock::sleep_nanoseconds(nanoseconds);
-            sleeps_after_six += audio.blocks.size() == 6;
+            ++sleeps_after[audio.blocks.size()];
         }
         FakeAudioDevice& audio;
-        int sleeps_after_six = 0;
+        int sleeps_after[8] = {};
     } counting(device);
     KvoSound sound = MonoSound(Ramp(70000), 1000);
 
@@ -214,7 +214,8 @@ TEST_F(SoundControl, PlayWaitsUntilHalfOfTheQueueIsFree)
     // Six blocks fit before the seventh has to wait for 10000 samples, which
     // take ten seconds.
     EXPECT_EQ(device.blocks, std::vector<long>(7, 10000));
-    EXPECT_EQ(counting.sleeps_after_six, 100);
+    EXPECT_EQ(counting.sleeps_after[5], 0);
+    EXPECT_EQ(counting.sleeps_after[6], 100);
     EXPECT_EQ(device.played, Ramp(70000));
 }
 
