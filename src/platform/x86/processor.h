@@ -9,7 +9,8 @@
 #ifndef ZT_PLATFORM_X86_PROCESSOR_H
 #define ZT_PLATFORM_X86_PROCESSOR_H
 
-#if __has_include(<sys/platform/x86.h>)
+// The header is no C++ to clang.
+#if __has_include(<sys/platform/x86.h>) && !defined(__clang__)
 #include <sys/platform/x86.h>
 #else
 /// The compiler's own questions, where the C library answers none.
