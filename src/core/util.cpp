@@ -74,28 +74,6 @@ Number multiple_of(Number a, Number b)
 }
 } // namespace
 
-zt_core::FormattedText::FormattedText(const char* format, va_list arguments)
-    : text(local)
-{
-    if (!format)
-        format = "";
-    va_list again;
-    va_copy(again, arguments);
-    // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): the caller's
-    const int length = std::vsnprintf(local, sizeof local, format, arguments);
-    if (length < 0) {
-        text = format;
-    } else if (static_cast<std::size_t>(length) >= sizeof local) {
-        const std::size_t bytes = static_cast<std::size_t>(length) + 1;
-        longer.reset(new (std::nothrow) char[bytes]);
-        if (longer) {
-            std::vsnprintf(longer.get(), bytes, format, again);
-            text = longer.get();
-        }
-    }
-    va_end(again);
-}
-
 char* ZtNewString(const char* text, int extra)
 {
     const std::size_t length = text ? std::strlen(text) : 0;
@@ -126,7 +104,7 @@ char* ZtFmt(const char* format, ...)
 {
     va_list arguments;
     va_start(arguments, format);
-    const zt_core::FormattedText formatted(format, arguments);
+    const zt_core::FormattedText formatted("", format, arguments);
     va_end(arguments);
     return ZtNewTempString(formatted.Text());
 }

@@ -5,18 +5,18 @@
 /// Writing of text as it stands: no width, no fill, and no throwing, whatever
 /// the stream's owner has set.
 
-#include <cstring>
 #include <ostream>
+#include <string_view>
 
 namespace zt_core {
-/// Writes the characters of `text` up to its NUL.
+/// Writes the characters of `text`.
 ///
 /// A stream that its owner told to throw does not throw from here; its state
 /// bits say what happened.
-inline void write_text(std::ostream& out, const char* text)
+inline void write_text(std::ostream& out, std::string_view text)
 {
     try {
-        out.write(text, static_cast<std::streamsize>(std::strlen(text)));
+        out.write(text.data(), static_cast<std::streamsize>(text.size()));
     } catch (...) {
         // The state bits tell.
     }

@@ -3,12 +3,14 @@
 #include <cstdarg>
 #include <cstdlib>
 #include <cstring>
+#include <initializer_list>
 #include <iostream>
 #include <new>
 #include <string_view>
 
 #include "core/format_text.h"
 #include "core/write_text.h"
+#include "diag/reused_error.h"
 #include "diag/signal_report.h"
 #include "platform/signal_handler.h"
 
@@ -41,10 +43,7 @@ constinit void* default_handler_room = nullptr;
 // Not 0 while a queue is being changed, which a signal must leave alone then.
 constinit volatile int queues_in_change = 0;
 
-// Stands in for a text that could not be kept.
-char no_text[1] = "";
-
-void print(const char* text)
+void print(std::string_view text)
 {
     if (zt_diag::in_signal()) {
         zt_platform::write_standard_error(text);
@@ -87,46 +86,57 @@ bool was_dropped(int level)
     return true;
 }
 
-// Makes and posts a report of up to three pieces of text. Without the memory
-// for it the text goes where it would have ended up without other handlers.
-void report(Kind kind, int level, const char* prefix, const char* text,
-            const char* end, int system_error)
+// Makes and posts a report. Without the memory for it the text goes where it
+// would have ended up without other handlers.
+void report(Kind kind, int level,
+            std::initializer_list<std::string_view> pieces, int system_error)
 {
+    ZtErr* const made = zt_diag::make_error(kind, level, system_error, pieces);
     errno = system_error;
-    auto* const made = new (std::nothrow) ZtErr(prefix, kind, level);
     if (made) {
-        made->stream << text << end;
-        if (made->stream.good()) {
-            made->Post();
-            return;
-        }
-        delete made;
+        made->Post();
+        return;
     }
     if (level >= ZtErrHandler::outputLevel)
-        for (const char* piece : {prefix ? prefix : "", text, end})
+        for (const std::string_view piece : pieces)
             print(piece);
     if (level >= ZtErrHandler::abortLevel)
         ZtErrHandler::Abort();
 }
 
-int failed_check(Kind kind, const char* prefix, const char* text, int level)
+int failed_check(Kind kind, std::string_view prefix, const char* text,
+                 int level)
 {
     if (!was_dropped(level))
-        report(kind, level, prefix, text, "\n", oserror());
+        report(kind, level, {prefix, text, "\n"}, oserror());
     return 1;
 }
 
-void post_message(Kind kind, int level, const char* prefix, const char* format,
-                  va_list arguments) __attribute__((format(printf, 4, 0)));
+void post_message(Kind kind, int level, std::string_view prefix,
+                  const char* format, va_list arguments)
+    __attribute__((format(printf, 4, 0)));
 
-void post_message(Kind kind, int level, const char* prefix, const char* format,
-                  va_list arguments)
+void post_message(Kind kind, int level, std::string_view prefix,
+                  const char* format, va_list arguments)
 {
     if (was_dropped(level))
         return;
     const int system_error = oserror();
-    const zt_core::FormattedText formatted(format, arguments);
-    report(kind, level, prefix, formatted.Text(), "", system_error);
+    const zt_core::FormattedText formatted(prefix, format, arguments);
+    report(kind, level, {formatted.View()}, system_error);
+}
+
+std::string_view up_to_nul(std::string_view text)
+{
+    return text.substr(0, text.find('\0'));
+}
+
+// Without the memory for its message an error is printed out of its stream.
+void print(ZtErr& unclaimed)
+{
+    const char* const message = unclaimed.Message();
+    print(message == zt_diag::no_text ? up_to_nul(unclaimed.stream.view())
+                                      : message);
 }
 
 // What becomes of an error that no handler has taken.
@@ -136,7 +146,7 @@ void settle(ZtErr* unclaimed)
         ZtErrHandler::output = &std::cerr;
     const int level = unclaimed->level;
     if (level >= ZtErrHandler::outputLevel)
-        print(unclaimed->Message());
+        print(*unclaimed);
     zt_diag::dispose(unclaimed);
     if (level >= ZtErrHandler::abortLevel)
         ZtErrHandler::Abort();
@@ -211,7 +221,7 @@ ZtErr::ZtErr(const char* text, int error_code, int error_level)
 
 ZtErr::~ZtErr()
 {
-    if (message != no_text)
+    if (message != zt_diag::no_text)
         delete[] message;
 }
 
@@ -219,11 +229,10 @@ char* ZtErr::Message()
 {
     if (message)
         return message;
-    std::string_view text = stream.view();
-    text = text.substr(0, text.find('\0'));
+    const std::string_view text = up_to_nul(stream.view());
     message = new (std::nothrow) char[text.size() + 1];
     if (!message)
-        return message = no_text;
+        return message = zt_diag::no_text;
     text.copy(message, text.size());
     message[text.size()] = '\0';
     return message;
@@ -284,8 +293,7 @@ ZtErrHandler::~ZtErrHandler()
 {
     Release();
     if (handlerStack != this) {
-        report(Message, error, "Error: handler stack confused\n", "", "",
-               oserror());
+        report(Message, error, {"Error: handler stack confused\n"}, oserror());
         Abort();
     }
     handlerStack = next;
@@ -398,6 +406,6 @@ void ZtStatus(const char* format, ...)
 {
     va_list arguments;
     va_start(arguments, format);
-    post_message(Status, information, nullptr, format, arguments);
+    post_message(Status, information, "", format, arguments);
     va_end(arguments);
 }

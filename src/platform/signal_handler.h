@@ -9,6 +9,7 @@
 /// stream.
 
 #include <cstddef>
+#include <string_view>
 
 namespace zt_platform {
 
@@ -73,9 +74,7 @@ private:
 };
 
 /// Writes `text` to standard error, past every stream.
-///
-/// Requires: `text` is not null.
-void write_standard_error(const char* text);
+void write_standard_error(std::string_view text);
 
 } // namespace zt_platform
 

@@ -470,6 +470,20 @@ TEST(ZtErrHandler, HandleStandsBehindTheOperationsOfObjects)
     EXPECT_EQ(SlotOf(&ZtErrHandler::Handle), 11);
 }
 
+TEST(ZtErrHandler, WithoutMemoryForTheMessagePrintsItOutOfTheStream)
+{
+    auto* const error = new ZtErr("Error: lost\n", 0, 4);
+    error->stream.write("\0more", 5);
+    CapturedStderr captured;
+
+    {
+        FailingMemory none;
+        error->Post();
+    }
+
+    EXPECT_EQ(captured.Text(), "Error: lost\n");
+}
+
 TEST(ZtErrHandler, WithoutMemoryToHoldBackHandlesAtOnce)
 {
     class Counting : public ZtErrHandler

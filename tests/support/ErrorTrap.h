@@ -22,7 +22,8 @@ public:
     ErrorTrap();
     ~ErrorTrap() override;
 
-    /// Takes the error over and keeps what it says.
+    /// Takes the error over and keeps what it says; forgets it when there is
+    /// no memory for that.
     void Handle(ZtErr* error) override;
 
     /// Gives the texts of all reports, one after the other.

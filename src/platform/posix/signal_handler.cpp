@@ -1,7 +1,6 @@
 #include "platform/signal_handler.h"
 
 #include <cerrno>
-#include <cstring>
 #include <signal.h>
 #include <unistd.h>
 
@@ -64,18 +63,16 @@ ErrnoKept::~ErrnoKept()
     errno = kept;
 }
 
-void write_standard_error(const char* text)
+void write_standard_error(std::string_view text)
 {
     const ErrnoKept errno_kept;
-    std::size_t left = std::strlen(text);
-    while (left > 0) {
-        const ssize_t went = write(STDERR_FILENO, text, left);
+    while (!text.empty()) {
+        const ssize_t went = write(STDERR_FILENO, text.data(), text.size());
         if (went < 0 && errno == EINTR)
             continue;
         if (went <= 0)
             return;
-        text += went;
-        left -= static_cast<std::size_t>(went);
+        text.remove_prefix(static_cast<std::size_t>(went));
     }
 }
 
