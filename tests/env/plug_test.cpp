@@ -1,5 +1,7 @@
 #include "ZT/plug.h"
 
+#include <cstddef>
+#include <cstring>
 #include <limits>
 #include <map>
 #include <random>
@@ -42,9 +44,27 @@ bool MatchesOlder(const char* catalog_id, const char* plug_id)
     return catalog.plug_id_matches(plug_id) != 0;
 }
 
+/// Gives the slot of a virtual operation in its class's table.
+template <class Operation>
+std::ptrdiff_t SlotOf(Operation operation)
+{
+    std::ptrdiff_t words[2] = {};
+    static_assert(sizeof(operation) == sizeof(words));
+    std::memcpy(words, &operation, sizeof(words));
+    return words[0] / static_cast<std::ptrdiff_t>(sizeof(void*));
+}
+
 constexpr int most = std::numeric_limits<int>::max();
 
 } // namespace
+
+TEST(ZtPlugCatalog, ItsOwnOperationsFollowThoseOfAnObject)
+{
+    const std::ptrdiff_t last = SlotOf(&KvoObject::ClassInfo);
+
+    EXPECT_EQ(SlotOf(&ZtPlugCatalog::InitializePlug), last + 1);
+    EXPECT_EQ(SlotOf(&ZtPlugCatalog::Extension), last + 2);
+}
 
 // --- ids -------------------------------------------------------------------
 

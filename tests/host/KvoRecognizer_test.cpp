@@ -293,6 +293,17 @@ TEST(KvoRecognizerTarget, BeginsWithItsNameOnly)
     EXPECT_EQ(target.user_data, nullptr);
 }
 
+TEST(KvoRecognizerTarget, FieldsStandInTheirOrder)
+{
+    using Target = KvoRecognizerTarget;
+
+    EXPECT_EQ(offsetof(Target, name), 0U);
+    EXPECT_LT(offsetof(Target, name), offsetof(Target, configured));
+    EXPECT_LT(offsetof(Target, configured), offsetof(Target, picture_name));
+    EXPECT_LT(offsetof(Target, picture_name), offsetof(Target, picture));
+    EXPECT_LT(offsetof(Target, picture), offsetof(Target, user_data));
+}
+
 TEST(KvoRecognizerTarget, ANullNameIsTheEmptyOne)
 {
     KvoRecognizerTarget target(nullptr);

@@ -173,4 +173,46 @@ print(parameters.nchannels, parameters.sampwidth, parameters.framerate,
     ExpectLoaded("theirs.aifc");
 }
 
+TEST_P(SoundPartners, CompressionWithoutLossChangesNothing)
+{
+    if (width == 1)
+        width = 2; // what it is encoded as
+    directory.Write("raw", RawBytes(MakeSamples()));
+
+    Shell(std::string(ZT_FFMPEG) + " -f s16le -ar 22050 -ac " + Channels() +
+          " -i" + In("raw") + "-sample_fmt " + (width == 4 ? "s32" : "s16") +
+          In("theirs.flac"));
+
+    ExpectLoaded("theirs.flac");
+}
+
+// A compressed sound goes beyond the range where the original did not.
+TEST(SoundCompressed, LoudSoundsAreClampedAndDoNotWrapAround)
+{
+    const TempDir directory;
+    Samples wave;
+    for (int i = 0; i < 44100; ++i)
+        wave.push_back(i / 100 % 2 ? short{32767} : short{-32768});
+    directory.Write("raw", RawBytes(wave));
+    for (const std::string kind : {"ogg", "mp3"}) {
+        Shell(std::string(ZT_FFMPEG) + " -f s16le -ar 22050 -ac 1 -i '" +
+              directory.Path("raw") + "' '" + directory.Path("wave." + kind) +
+              "'");
+
+        const KvoSound sound(directory.Path("wave." + kind).c_str());
+
+        EXPECT_EQ(sound.width, 2) << kind;
+        EXPECT_EQ(sound.rate, 22050) << kind;
+        ASSERT_GE(sound.frames, 44100) << kind;
+        int ends = 0;
+        int jumps = 0;
+        for (long i = 5000; i < 40000; ++i) {
+            ends += sound.samples[i] == 32767 || sound.samples[i] == -32768;
+            jumps += std::abs(sound.samples[i] - sound.samples[i - 1]) > 50000;
+        }
+        EXPECT_GT(ends, 100) << kind;
+        EXPECT_LT(jumps, 400) << kind; // one for each of 350 edges at most
+    }
+}
+
 } // namespace

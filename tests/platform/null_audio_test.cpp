@@ -187,6 +187,20 @@ TEST_F(NullAudio, YearsAndTheGreatestRateDoNotOverflow)
     port->release();
 }
 
+TEST_F(NullAudio, HalfAnHourAtAHighRateDoesNotOverflow)
+{
+    device.parameters().set(audio_output_rate, 1 << 30);
+    AudioPort* const port = Opened();
+    const Samples some(100);
+    port->write(some.data(), 100);
+
+    // In nanoseconds, times the rate, this is a multiple of 2^64.
+    clock.AdvanceMicroseconds(1L << 31);
+
+    EXPECT_EQ(port->filled(), 0);
+    port->release();
+}
+
 TEST_F(NullAudio, RecordsSilenceAtThePaceOfTheInputRate)
 {
     device.parameters().set(audio_input_rate, 16000);

@@ -322,6 +322,7 @@ TEST_F(FileDeviceTest, AFileThatCannotBeKeptIsReported)
     KvoSound sound = MonoSound(Ramp(10), 8000);
 
     Control::Play(&sound);
+    Control::OutputRate(); // says it no more
 
     EXPECT_EQ(reports.Text(), "Error: Failed to write audio file "
                               "[/dev/full].\n");

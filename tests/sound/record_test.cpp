@@ -1,3 +1,5 @@
+#include <cstddef>
+#include <iterator>
 #include <memory>
 
 #include "sound/SoundTest.h"
@@ -43,6 +45,23 @@ TEST_F(RecordTest, BeforeTheFirstRecordingThereIsNoResult)
     EXPECT_EQ(Control::sound_record.has_data, 0);
     EXPECT_EQ(Control::sound_record.rate, 8000);
     EXPECT_EQ(Control::sound_record.channels, 1);
+}
+
+TEST_F(RecordTest, FieldsStandInTheirOrder)
+{
+    using Fields = ZtSoundControl::SoundRecord;
+
+    EXPECT_EQ(offsetof(Fields, recording), 0U);
+    EXPECT_EQ(offsetof(Fields, has_data), 4U);
+    EXPECT_EQ(offsetof(Fields, rate), 8U);
+    EXPECT_EQ(offsetof(Fields, channels), 12U);
+    EXPECT_EQ(offsetof(Fields, chunk_size), 16U);
+    EXPECT_EQ(offsetof(Fields, last_count), 20U);
+    EXPECT_EQ(offsetof(Fields, chunk_count), 24U);
+    EXPECT_LT(offsetof(Fields, chunk_count), offsetof(Fields, current_chunk));
+    EXPECT_LT(offsetof(Fields, current_chunk), offsetof(Fields, chunks));
+    EXPECT_LT(offsetof(Fields, chunks), offsetof(Fields, port));
+    EXPECT_EQ(std::size(Control::sound_record.chunks), 100U);
 }
 
 TEST_F(RecordTest, SixtyThousandSamplesAreTwoChunksAndTenThousand)

@@ -428,6 +428,23 @@ TEST(sound_files, FloatingSamplesAreScaledTruncatedAndClamped)
                        32767, -32768}));
 }
 
+TEST(sound_files, FloatingSamplesOfDoublePrecisionAreTakenLikeOthers)
+{
+    std::string data;
+    for (double value : {0.5, 1.0, -7.0, 0.99999, -1.9 / 32768}) {
+        std::uint64_t bits;
+        std::memcpy(&bits, &value, sizeof bits);
+        data += LittleEndian(static_cast<std::uint32_t>(bits), 4) +
+                LittleEndian(static_cast<std::uint32_t>(bits >> 32), 4);
+    }
+
+    const Loaded loaded = Load(Wave(3, 1, 64, data));
+
+    EXPECT_EQ(loaded.sound.width, 4);
+    EXPECT_EQ(SamplesOf(loaded.sound),
+              (Samples{16384, 32767, -32768, 32767, -1}));
+}
+
 TEST(sound_files, LongFloatingStereoSoundsAreReadWhole)
 {
     std::string data;
