@@ -401,6 +401,31 @@ TEST_F(PortAudio, AFullInputQueueLosesWholeFrames)
     EXPECT_EQ(Read(port, 10), (Samples{2, 3}));
 }
 
+TEST_F(PortAudio, NoHalfOfAFrameIsQueued)
+{
+    AudioPort* const port = Opened(2, 44100, AudioDirection::Record);
+    Bring(Stream(), Samples(100000, 1));
+    Read(port, 1);
+
+    Bring(Stream(), {2, 3});
+    EXPECT_EQ(port->filled(), 99999);
+    device->parameters().set(audio_input_rate, 88200);
+    Bring(Stream(), {4, 5});
+
+    EXPECT_EQ(port->filled(), 99999);
+}
+
+TEST_F(PortAudio, AnAbsurdRateTakesAThousandFramesAtATime)
+{
+    AudioPort* const port = Opened(1, 44100);
+    Write(port, Samples(5000, 1));
+    device->parameters().set(audio_output_rate, 2147483647);
+
+    Taken(Stream(), 2);
+
+    EXPECT_EQ(port->filled(), 3000);
+}
+
 TEST_F(PortAudio, WhileMonitoringIsOnTheInputIsHeard)
 {
     AudioPort* const port = Opened(1, 44100, AudioDirection::Record);

@@ -730,9 +730,12 @@ TEST(KvoSound, OtherChannelCountsGiveOneErrorAndNoChange)
 
 TEST(KvoSound, WithoutABufferNothingHappensAndNothingIsSaid)
 {
-    for (int channels : {1, 2, 3}) {
+    for (auto [channels, frames] :
+         {std::pair(1, 0), std::pair(2, 0), std::pair(3, 0), std::pair(1, 9),
+          std::pair(2, 9), std::pair(3, 9)}) {
         KvoSound sound;
         sound.channels = channels;
+        sound.frames = frames;
         KvoSound other = MonoSound({1, 2});
         const ErrorTrap reports;
 
@@ -752,13 +755,21 @@ TEST(KvoSound, WithoutABufferNothingHappensAndNothingIsSaid)
         sound.BandPass(10, 10);
         sound.Window(Seconds(0), Seconds(0), KvoSound::Hamming);
         sound.ComputeMinMax();
+        other.Match(sound);
+        other.Insert(&sound, Seconds(0));
+        const KvoSound copy(sound);
+        const KvoSound before = sound + other;
+        const KvoSound behind = other + sound;
 
+        EXPECT_EQ(copy.samples, nullptr);
+        EXPECT_EQ(SamplesOf(before), (Samples{1, 2}));
+        EXPECT_EQ(SamplesOf(behind), (Samples{1, 2}));
         EXPECT_EQ(sound.Extract(0, 1), nullptr);
         EXPECT_EQ(sound.Extract(Seconds(0), Seconds(1)), nullptr);
         EXPECT_EQ(sound.ChannelData(4), nullptr);
         EXPECT_EQ(sound.Volume(), 0);
         EXPECT_EQ(sound.samples, nullptr);
-        EXPECT_EQ(sound.frames, 0);
+        EXPECT_EQ(sound.frames, frames);
         EXPECT_EQ(sound.channels, channels);
         EXPECT_EQ(sound.rate, 8000);
         EXPECT_EQ(SamplesOf(other), (Samples{1, 2}));

@@ -199,13 +199,14 @@ TEST_F(DragTest, AnIntervalBelowZeroPlaysNothing)
 TEST_F(DragTest, ASoundWithoutABufferIsSilence)
 {
     ZtTimer timer;
-    KvoSound empty;
+    KvoSound empty(8000, 1, 1000, nullptr);
     Control::PlayDrag(&empty, &timer, 100, &position);
     Start(timer);
     position = 0.5F;
 
     RunFor(0.3);
 
+    EXPECT_FALSE(device.written.empty());
     EXPECT_EQ(device.written, Samples(device.written.size()));
 }
 
@@ -227,6 +228,39 @@ TEST_F(DragTest, StoppingTheTimerEndsTheDragForGood)
     EXPECT_EQ(device.written.size(), written);
     timer.stop();
     Beats(1);
+}
+
+TEST_F(DragTest, AStopRecordOfAnEarlierDragDoesNotEndALaterOne)
+{
+    ZtTimer first;
+    ZtTimer second;
+    Control::PlayDrag(&sound, &first, 100, &position);
+    Start(first);
+    first.stop();
+    Beats(2);
+    Control::PlayDrag(&sound, &second, 100, &position);
+    Start(second);
+    Start(first);
+
+    first.stop();
+    Beats(2);
+
+    EXPECT_EQ(device.open_ports, 1);
+}
+
+TEST_F(DragTest, TheEndOfTheSoundIsItsLastSample)
+{
+    ZtTimer timer;
+    position = 1.0F;
+    Control::PlayDrag(&sound, &timer, 100, &position);
+    Start(timer);
+
+    position = 0.75F;
+    RunFor(0.1);
+
+    ASSERT_GT(device.written.size(), 3000U);
+    EXPECT_EQ(device.written[0], 31999);
+    EXPECT_LT(device.written.back(), 24100);
 }
 
 TEST_F(DragTest, ANaturalEndOnlyInterruptsTheDrag)

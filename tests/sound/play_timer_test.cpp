@@ -447,6 +447,25 @@ TEST_F(PlayTimer, StoppingTheTimerStopsTheSoundForGood)
     EXPECT_EQ(device.opens.size(), 1U);
 }
 
+TEST_F(PlayTimer, AStopRecordOfAnEarlierSoundDoesNotEndALaterOne)
+{
+    ZtTimer first(KvoTime(), one_second);
+    ZtTimer second(KvoTime(), ten_seconds);
+    KvoSound sound = MonoSound(Ramp(80000), 8000);
+    Control::Play(&sound, &first, KvoTime());
+    Start(first);
+    RunFor(1.2); // the end of the timer ends the sound, its stop record stays
+    Control::Play(&sound, &second, KvoTime());
+    Start(second);
+    Start(first);
+
+    first.stop();
+    Beats(2);
+
+    EXPECT_EQ(device.open_ports, 1);
+    EXPECT_TRUE(Control::Playing(&sound));
+}
+
 TEST_F(PlayTimer, TheEndOfTheTimerEndsTheSoundForGood)
 {
     ZtTimer timer(KvoTime(), one_second);
@@ -657,6 +676,21 @@ TEST_F(PlayTimer, BeyondTheMostSoundsEachIsReported)
     EXPECT_EQ(device.opens.size(), 40U);
 }
 
+TEST_F(PlayTimer, ASoundBeyondTheMostGivesItsPortBack)
+{
+    ZtTimer timer(KvoTime(), ten_seconds);
+    KvoSound sound = MonoSound(Ramp(4), 8000);
+    device.refuses_ports = true;
+    for (int number = 0; number < 64; ++number)
+        Control::Play(&sound, &timer, one_second);
+    device.refuses_ports = false;
+
+    Control::Play(&sound, &timer, one_second);
+
+    EXPECT_EQ(reports.count, 1);
+    EXPECT_EQ(device.ready_ports, 0);
+}
+
 TEST_F(PlayTimer, ACallbackWithAnUnknownTokenDoesNothing)
 {
     ZtTimer timer(KvoTime(), ten_seconds);
@@ -678,7 +712,7 @@ TEST_F(PlayTimer, ACallbackWithAnUnknownTokenDoesNothing)
 TEST_F(PlayTimer, NullsAndEmptySoundsPlayNothing)
 {
     ZtTimer timer(KvoTime(), ten_seconds);
-    KvoSound sound;
+    KvoSound sound(8000, 1, 1000, nullptr);
 
     Control::Play(nullptr, &timer, KvoTime());
     Control::Play(&sound, nullptr, KvoTime());

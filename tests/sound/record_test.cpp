@@ -520,11 +520,12 @@ TEST_F(RecordTest, APortThatDoesNotOpenIsReportedAndGivenBack)
     Control::Record(&timer, KvoTime());
     device.refuses_opens = true;
     Start(timer);
-    Beats(1);
+    Beats(2);
 
     EXPECT_EQ(reports.Text(),
               "Error: Failed to open an audio port for reading.\n");
     EXPECT_EQ(device.ready_ports, 0);
+    EXPECT_EQ(timer.callbacks, nullptr); // it is not tried again
     EXPECT_EQ(timer.stop_callbacks, nullptr);
 }
 

@@ -278,7 +278,7 @@ TEST_F(SoundControl, PlayEndsWhenASpeedUsesNoSample)
 
 TEST_F(SoundControl, ASoundWithoutABufferIsPlayedAsNothing)
 {
-    KvoSound sound;
+    KvoSound sound(8000, 2, 1000, nullptr);
 
     Control::Play(&sound);
 
