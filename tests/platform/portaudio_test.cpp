@@ -24,6 +24,7 @@ struct FakeStream
     bool plays = false;
     int channels = 0;
     double rate = 0;
+    double latency = 0; ///< In seconds, as suggested.
     PaStreamCallback* call = nullptr;
     PaStreamFinishedCallback* finished = nullptr;
     void* data = nullptr;
@@ -74,6 +75,7 @@ PaError Open(PaStream** stream, const PaStreamParameters* input,
     made.plays = output != nullptr;
     made.channels = output ? output->channelCount : input->channelCount;
     made.rate = rate;
+    made.latency = (output ? output : input)->suggestedLatency;
     made.call = call;
     made.data = data;
     made.open = true;
@@ -265,6 +267,7 @@ TEST_F(PortAudio, APortThatIsReadyHasARunningStreamThatIsSilent)
     EXPECT_TRUE(Stream().plays);
     EXPECT_EQ(Stream().channels, 2);
     EXPECT_EQ(Stream().rate, 22050);
+    EXPECT_GE(Stream().latency, 0.1); // less would break on a busy machine
     EXPECT_EQ(Taken(Stream(), 3), Samples(6));
 }
 
@@ -442,6 +445,38 @@ TEST_F(PortAudio, WhileMonitoringIsOnTheInputIsHeard)
     device->parameters().set(audio_monitor, 0);
     EXPECT_TRUE(Soon([&] { return !monitor.open; }));
     EXPECT_TRUE(Stream().open);
+}
+
+TEST_F(PortAudio, TheNextRecordingIsHeardWhenTheOneBeforeHasEnded)
+{
+    AudioPort* const before = Opened(1, 44100, AudioDirection::Record);
+    device->parameters().set(audio_monitor, 1);
+    ASSERT_TRUE(Soon([&] { return library.opened == first + 2; }));
+    ports.clear();
+    before->release();
+    ASSERT_TRUE(Soon([&] { return !Stream().open && !Stream(1).open; }));
+
+    Opened(1, 44100, AudioDirection::Record);
+    ASSERT_TRUE(Soon([&] { return library.opened == first + 4; }));
+    ASSERT_TRUE(Soon([&] { return Stream(3).started.load(); }));
+
+    EXPECT_TRUE(Soon([&] {
+        Bring(Stream(2), {1000});
+        return Taken(Stream(3), 1) == Samples{1000};
+    }));
+}
+
+TEST_F(PortAudio, TheLibraryIsNotBegunAnewUnderARunningStream)
+{
+    AudioPort* const port = Opened();
+    Write(port, {1, 2});
+    library.start = paUnanticipatedHostError;
+    const int terminated = library.terminated;
+
+    EXPECT_EQ(Ready(), nullptr);
+
+    EXPECT_EQ(library.terminated, terminated);
+    EXPECT_EQ(Taken(Stream(), 2), (Samples{1, 2}));
 }
 
 TEST_F(PortAudio, ADeviceThatVanishesSwallowsWhatIsWritten)

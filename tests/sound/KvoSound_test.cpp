@@ -3,6 +3,7 @@
 #include <cmath>
 #include <cstddef>
 #include <iostream>
+#include <locale>
 #include <memory>
 #include <sstream>
 #include <type_traits>
@@ -13,6 +14,7 @@
 #include "sound/sounds.h"
 #include "support/ErrorTrap.h"
 #include "support/FakeRandom.h"
+#include "support/OtherLocale.h"
 
 namespace {
 
@@ -378,6 +380,21 @@ TEST(KvoSound, StatsPrintsThreeLines)
 
     sound.Stats();
 
+    EXPECT_EQ(out.text.str(), "Sample frequency : 44100 hz\n"
+                              "Frame count      : 57330\n"
+                              "Length           : 1.3 seconds\n");
+}
+
+TEST(KvoSound, StatsDoesNotDependOnTheLocale)
+{
+    const OtherLocale german("de_DE");
+    CapturedStdout out;
+    std::cout.imbue(std::locale());
+    const KvoSound sound(44100, 2, 57330, nullptr);
+
+    sound.Stats();
+
+    std::cout.imbue(std::locale::classic());
     EXPECT_EQ(out.text.str(), "Sample frequency : 44100 hz\n"
                               "Frame count      : 57330\n"
                               "Length           : 1.3 seconds\n");
