@@ -62,9 +62,9 @@ public:
 
         unsigned char actions[256];
         /// What a scan of sixteen characters at a time compares with: up to
-        /// four specials above the space that are no quotes, each filling a
-        /// row, the rows left over filled with the double quote.
-        char vector_stops[4][16];
+        /// three specials that are no quotes, each filling a row, the rows
+        /// left over filled with the double quote.
+        char vector_stops[3][16];
         bool vector_scannable; ///< Whether the specials fit above.
     };
 
@@ -289,6 +289,7 @@ protected:
 
 private:
     friend class KvoTokenReader;
+    static constexpr std::size_t most_spare_text_bytes = 256;
 
     KvoToken* spare_token();
     KvoToken* make_spare_token();
@@ -296,7 +297,6 @@ private:
     void trim_spares(int fresh);
     bool is_end_character(char character) const;
     bool ends_run(const KvoToken& token) const;
-    void drop_run(std::istream& in, KvoTokenReader& reader) const;
 
     KvoToken model; ///< What every token that is read starts as a copy of.
     /// The list's tokens, then spare ones that wait for their next use, so
@@ -341,6 +341,12 @@ inline bool KvoTokenList::is_end_character(char character) const
         if (*c == character)
             return true;
     return false;
+}
+
+inline bool KvoTokenList::ends_run(const KvoToken& token) const
+{
+    return !token.quote &&
+           (token.length == 0 || is_end_character(token.text[0]));
 }
 
 #endif

@@ -48,7 +48,7 @@ void KvoToken::Set(const char* new_text)
 
 void KvoToken::Read(std::istream& in)
 {
-    KvoTokenReader(in).read(*this);
+    KvoTokenReader::read_token(in, *this);
 }
 
 void KvoToken::Write(std::ostream& out)

@@ -14,7 +14,6 @@ namespace {
 // What an emptied list keeps for its next statement: this many tokens, and of
 // each no more text than this.
 constexpr int most_spare_tokens = 64;
-constexpr std::size_t most_spare_text_bytes = 256;
 
 // The two strings one behind the other; null when there is no memory.
 std::unique_ptr<char[]> joined(const char* first, const char* second)
@@ -158,40 +157,9 @@ KvoToken* KvoTokenList::append_token(const char* text)
     return token;
 }
 
-// A token that is read stands behind the list's own until it proves to be more
-// than the end of the run.
 KvoTokenList::Run KvoTokenList::append_run(std::istream& in, char mark)
 {
-    Run run = Run::Plain;
-    if (!in.good())
-        return run;
-    KvoTokenReader reader(in);
-    do {
-        reader.read_plain_tokens(*this, mark);
-        if (reader.take_end(*this))
-            return run;
-        KvoToken* token = spare_token();
-        if (!token) {
-            drop_run(in, reader);
-            return Run::Cut;
-        }
-        reader.read(*token);
-        long_texts = long_texts || token->capacity > most_spare_text_bytes;
-        if (ends_run(*token))
-            return run;
-        ++count;
-        run = Run::Mixed;
-    } while (in.good());
-    return run;
-}
-
-// Reads the rest of a run into a token that needs no memory to be made.
-void KvoTokenList::drop_run(std::istream& in, KvoTokenReader& reader) const
-{
-    KvoToken dropped(model);
-    do
-        reader.read(dropped);
-    while (!ends_run(dropped) && in.good());
+    return in.good() ? KvoTokenReader::read_run(in, *this, mark) : Run::Plain;
 }
 
 void KvoTokenList::remove_tokens(int index, int removed)
@@ -243,10 +211,4 @@ void KvoTokenList::trim_spares(int fresh)
         if (token_at(i)->capacity > most_spare_text_bytes)
             token_at(i)->release_text();
     long_texts = count > 0;
-}
-
-bool KvoTokenList::ends_run(const KvoToken& token) const
-{
-    return !token.quote &&
-           (token.length == 0 || is_end_character(token.text[0]));
 }

@@ -27,8 +27,8 @@ void KvoToken::ActionTable::note_vector_stops()
     constexpr int rows = sizeof vector_stops / sizeof vector_stops[0];
     std::memset(vector_stops, '"', sizeof vector_stops);
     int used = 0;
-    for (int code = ' ' + 1; code < 256; ++code) {
-        if (actions[code] != Special)
+    for (int code = 1; code < 256; ++code) {
+        if ((actions[code] & (Special | QuoteOrEscape)) != Special)
             continue;
         if (used == rows) {
             vector_scannable = false;

@@ -32,11 +32,72 @@ struct BufferView : std::streambuf
 };
 } // namespace
 
+/// Hands out a list's spare tokens one after the other. What that takes of the
+/// list is kept here meanwhile, since every copy into a token could change the
+/// list for all the compiler knows.
+class KvoTokenReader::SpareTokens
+{
+public:
+    explicit SpareTokens(KvoTokenList& tokens_of)
+        : list(tokens_of), table(*tokens_of.model.table)
+    {
+        look();
+    }
+    ~SpareTokens() { list.count = count; }
+    SpareTokens(const SpareTokens&) = delete;
+    SpareTokens& operator=(const SpareTokens&) = delete;
+
+    /// Gives the next one the first `bytes` characters at `from` and adds it to
+    /// the list.
+    ///
+    /// A copy of one size, whatever the token's, costs least.
+    ///
+    /// Requires: bytes < `KvoToken::room_bytes`, as many as which can be read.
+    /// Returns:  whether there was memory for the token.
+    bool Use(const char* from, std::size_t bytes)
+    {
+        if (count == held && !make())
+            return false;
+        auto* token = static_cast<KvoToken*>(all[count++]);
+        std::memcpy(token->text, from, KvoToken::room_bytes);
+        token->text[bytes] = '\0';
+        token->length = bytes;
+        token->quote = 0;
+        token->table = &table;
+        token->modified = 0;
+        return true;
+    }
+
+    KvoTokenList& list;
+    const KvoToken::ActionTable& table;
+
+private:
+    void look()
+    {
+        all = static_cast<KvoObject**>(list.tokens.data);
+        held = list.tokens.size;
+        count = list.count;
+    }
+
+    bool make()
+    {
+        list.count = count;
+        const bool made = list.make_spare_token() != nullptr;
+        look();
+        return made;
+    }
+
+    KvoObject** all;
+    int held;
+    int count;
+};
+
 // A tied output stream is flushed before the first character, as the first
 // `get` would do. A stream that is not good shows no characters, so that the
 // first `get` fails by itself and the buffer is not touched.
-KvoTokenReader::KvoTokenReader(std::istream& stream)
-    : in(stream), at(nullptr), limit(nullptr), pending(Pending::Nothing)
+inline KvoTokenReader::KvoTokenReader(std::istream& stream)
+    : in(stream), at(nullptr), pending(Pending::Nothing),
+      run(KvoTokenList::Run::Plain), limit(nullptr)
 {
     if (in.good() && in.tie()) {
         try {
@@ -48,27 +109,24 @@ KvoTokenReader::KvoTokenReader(std::istream& stream)
     view_buffer();
 }
 
-// The last step is done once more by the stream itself, so that its count of
-// characters is that of the last `get` or `putback` too.
-KvoTokenReader::~KvoTokenReader()
+// The stream's count of characters must be that of the last `get` or `putback`
+// too, which only the stream itself can set. Where it is not so already, from
+// the token before as a rule, the last step is done once more by the stream.
+inline KvoTokenReader::~KvoTokenReader()
 {
     char character;
-    switch (pending) {
-    case Pending::Took:
+    if (pending == Pending::Took && in.gcount() != 1) {
         --at;
         take_from_stream(character);
-        break;
-    case Pending::PutBack:
+    } else if (pending == Pending::PutBack && in.gcount() != 0) {
         character = *at++;
         put_back_into_stream(character);
-        break;
-    case Pending::Nothing:
+    } else {
         tell_buffer();
-        break;
     }
 }
 
-void KvoTokenReader::view_buffer()
+inline void KvoTokenReader::view_buffer()
 {
     at = limit = nullptr;
     if (in.good()) {
@@ -77,7 +135,7 @@ void KvoTokenReader::view_buffer()
     }
 }
 
-void KvoTokenReader::tell_buffer()
+inline void KvoTokenReader::tell_buffer()
 {
     if (at && at != BufferView::next(*in.rdbuf()))
         BufferView::move(*in.rdbuf(), at);
@@ -222,81 +280,135 @@ void KvoTokenReader::take_escaped(KvoToken& token)
         token.append_text(&character, 1);
 }
 
-void KvoTokenReader::read_plain_tokens(KvoTokenList& list, char mark)
-{
-    const KvoToken::ActionTable& table = *list.model.table;
-    if (!table.vector_scannable)
-        return;
-    while (limit - at >= zt_command::block_bytes) {
-        const std::uint64_t ends =
-            zt_command::ends_in_block(at, table.vector_stops);
-        if (ends == 0 || !read_mapped_tokens(list, ends, mark))
-            return;
-    }
-}
-
-// Most tokens are a few ordinary characters before a blank or a special one.
-// `ends` is a map of the characters in view that end such a run: the length of
-// a token is the number of clear bits at its low end, and what is taken is
-// shifted out. The position is kept in a variable of the function's own, since
-// every copy into a token could change a member for all the compiler knows.
+// Adds the words between each two of `edges`, which are bits for characters
+// from `block` on.
 //
-// Returns: whether everything in the map was taken, but for a token that goes
-//          on behind it.
-bool KvoTokenReader::read_mapped_tokens(KvoTokenList& list, std::uint64_t ends,
-                                        char mark)
+// Returns: the first word that was not added, since it does not end or there
+//          is no room for it; null if all were.
+const char* KvoTokenReader::add_words(KvoTokenList& list, const char* block,
+                                      std::uint64_t edges, char mark)
+{
+    SpareTokens spares(list);
+    while (edges != 0) {
+        const char* word = block + std::countr_zero(edges);
+        edges &= edges - 1;
+        const auto bytes = block + std::countr_zero(edges) - word;
+        if (edges == 0 || bytes >= KvoToken::room_bytes ||
+            !spares.Use(word, static_cast<std::size_t>(bytes)))
+            return word;
+        edges &= edges - 1;
+        if (*word == mark)
+            run = KvoTokenList::Run::Mixed;
+    }
+    return nullptr;
+}
+
+// Adds the special character that stands next, and goes behind it.
+bool KvoTokenReader::add_special(KvoTokenList& list)
+{
+    if (!SpareTokens(list).Use(at, 1))
+        return false;
+    run = KvoTokenList::Run::Mixed;
+    ++at;
+    return true;
+}
+
+// Most tokens are a few ordinary characters before a blank or a special one. A
+// map of the characters in view, gone through from stop to stop, says where
+// such words begin and where they end: the edges. A word ends at the stop
+// itself only if that is special, for a quote belongs to the word. A word at
+// the end of the map that may prove to be short begins the next one.
+inline KvoTokenReader::Ahead KvoTokenReader::read_block(KvoTokenList& list,
+                                                        char mark)
 {
     const KvoToken::ActionTable& table = *list.model.table;
-    const char* here = at;
-    while (ends != 0) {
-        const int bytes = std::countr_zero(ends);
-        const int stop = table.ActionOf(here[bytes]);
-        const bool blank = stop == KvoToken::ActionTable::Blank;
-        if (bytes > 0) {
-            if (*here == mark ||
-                !(blank || stop & KvoToken::ActionTable::Special) ||
-                !add_plain_token(list, here, bytes))
-                break;
-        } else if (!blank) {
-            break;
-        }
-        here += bytes;
-        ends >>= bytes;
-        pending = Pending::PutBack;
-        if (blank) [[likely]] {
-            ++here;
-            ends >>= 1;
+    const char* const block = at;
+    const zt_command::BlockMap map =
+        zt_command::map_of_block(block, table.vector_stops);
+    std::uint64_t ordinary = ~(map.blanks | map.stops);
+    for (std::uint64_t stops = map.stops;; stops &= stops - 1) {
+        const std::uint64_t stop = stops & (~stops + 1);
+        const std::uint64_t words = ordinary & (stop - 1);
+        at = block + std::countr_zero(stops);
+        const bool special =
+            stop != 0 && table.ActionOf(*at) & KvoToken::ActionTable::Special;
+        const std::uint64_t edges = words ^ (words << 1);
+        const char* const left =
+            add_words(list, block, special ? edges : edges & ~stop, mark);
+        if (left)
+            at = left;
+        if (stop == 0)
+            return block + zt_command::block_bytes - at < KvoToken::room_bytes
+                       ? Ahead::Unknown
+                       : Ahead::Other;
+        if (left || !special)
+            return Ahead::Other;
+        if (list.is_end_character(*at)) {
+            ++at;
             pending = Pending::Took;
+            return Ahead::Nothing;
         }
+        if (!add_special(list))
+            return Ahead::Other;
+        ordinary &= ~(stop | (stop - 1));
     }
-    at = here;
-    return ends == 0;
 }
 
-// A copy of one size, whatever the token's, costs least; so the token must fit
-// it and there must be as much in view.
-bool KvoTokenReader::add_plain_token(KvoTokenList& list, const char* from,
-                                     int bytes) const
+// Adds the tokens that come next, all in the stream's buffer, as long as they
+// are plain. A block has to be in view, and behind it as much as is copied of
+// its last word.
+//
+// Returns: whether the run has ended. If it has not, `read` must follow.
+inline bool KvoTokenReader::read_in_view(KvoTokenList& list, char mark)
 {
-    constexpr int copied = KvoToken::room_bytes;
-    if (bytes >= copied || limit - from < copied)
+    constexpr int seen = zt_command::block_bytes + KvoToken::room_bytes;
+    if (!list.model.table->vector_scannable)
         return false;
-    KvoToken* token = list.spare_token();
-    if (!token)
-        return false;
-    std::memcpy(token->text, from, copied);
-    token->text[bytes] = '\0';
-    token->length = static_cast<std::size_t>(bytes);
-    token->quote = 0;
-    ++list.count;
-    return true;
+    Ahead ahead = Ahead::Unknown;
+    while (ahead == Ahead::Unknown && limit - at >= seen)
+        ahead = read_block(list, mark);
+    return ahead == Ahead::Nothing;
 }
 
-bool KvoTokenReader::take_end(const KvoTokenList& list)
+// A token that is read stands behind the list's own until it proves to be more
+// than the end of the run.
+inline KvoTokenList::Run KvoTokenReader::read_all(KvoTokenList& list, char mark)
 {
-    if (at == limit || !list.is_end_character(*at))
-        return false;
-    ++at;
-    pending = Pending::Took;
-    return true;
+    do {
+        if (read_in_view(list, mark))
+            return run;
+        KvoToken* token = list.spare_token();
+        if (!token) {
+            drop_run(list);
+            return KvoTokenList::Run::Cut;
+        }
+        read(*token);
+        list.long_texts = list.long_texts ||
+                          token->capacity > KvoTokenList::most_spare_text_bytes;
+        if (list.ends_run(*token))
+            return run;
+        ++list.count;
+        run = KvoTokenList::Run::Mixed;
+    } while (in.good());
+    return run;
+}
+
+// Reads the rest of a run into a token that needs no memory to be made.
+void KvoTokenReader::drop_run(const KvoTokenList& list)
+{
+    KvoToken dropped(list.model);
+    do
+        read(dropped);
+    while (!list.ends_run(dropped) && in.good());
+}
+
+void KvoTokenReader::read_token(std::istream& in, KvoToken& token)
+{
+    KvoTokenReader(in).read(token);
+}
+
+KvoTokenList::Run KvoTokenReader::read_run(std::istream& in, KvoTokenList& list,
+                                           char mark)
+{
+    return KvoTokenReader(in).read_all(list, mark);
 }

@@ -18,36 +18,37 @@
 #include <istream>
 #include <streambuf>
 
-/// Takes tokens from one stream, from its construction to its destruction; in
-/// between nobody else touches the stream.
+/// Takes tokens from one stream; while it does nobody else touches the stream.
 class KvoTokenReader
 {
 public:
-    explicit KvoTokenReader(std::istream& stream);
-
-    /// Leaves the stream where the last token ended.
-    ~KvoTokenReader();
-
-    KvoTokenReader(const KvoTokenReader&) = delete;
-    KvoTokenReader& operator=(const KvoTokenReader&) = delete;
-
     /// Reads the next token with the token's own action table.
-    void read(KvoToken& token);
+    static void read_token(std::istream& in, KvoToken& token);
 
-    /// Adds to `list` the plain tokens that come next: a few ordinary
-    /// characters, the first of them not `mark`, before a blank or a special
-    /// one, all in the stream's buffer. Anything else is left to `read`.
-    void read_plain_tokens(KvoTokenList& list, char mark);
-
-    /// Takes the next character if it is in the stream's buffer and ends the
-    /// list's run.
+    /// Reads tokens up to the list's end character, which is dropped, or to the
+    /// end of input, and adds them to the list.
     ///
-    /// Returns: whether it was taken.
-    bool take_end(const KvoTokenList& list);
+    /// Returns: what sort of tokens they are, with `mark` as the mark.
+    static KvoTokenList::Run read_run(std::istream& in, KvoTokenList& list,
+                                      char mark);
 
 private:
+    class SpareTokens;
+
     /// What was last done to the characters in view and not yet to the stream.
     enum class Pending { Nothing, Took, PutBack };
+
+    /// What stands behind the words that were added.
+    enum class Ahead {
+        Unknown, ///< It has not been looked at yet.
+        Other,   ///< Something that is no plain token, or not for certain.
+        Nothing  ///< The run has ended.
+    };
+
+    explicit KvoTokenReader(std::istream& stream);
+    ~KvoTokenReader();
+    KvoTokenReader(const KvoTokenReader&) = delete;
+    KvoTokenReader& operator=(const KvoTokenReader&) = delete;
 
     bool take(char& character);
     bool take_from_stream(char& character);
@@ -56,17 +57,28 @@ private:
     void view_buffer();
     void tell_buffer();
 
+    void read(KvoToken& token);
     void skip_blanks(const KvoToken::ActionTable& table);
-    bool read_mapped_tokens(KvoTokenList& list, std::uint64_t ends, char mark);
-    bool add_plain_token(KvoTokenList& list, const char* from, int bytes) const;
     void take_ordinary(KvoToken& token);
     void take_quoted(KvoToken& token);
     void take_escaped(KvoToken& token);
 
+    KvoTokenList::Run read_all(KvoTokenList& list, char mark);
+    bool read_in_view(KvoTokenList& list, char mark);
+    Ahead read_block(KvoTokenList& list, char mark);
+    const char* add_words(KvoTokenList& list, const char* block,
+                          std::uint64_t edges, char mark);
+    bool add_special(KvoTokenList& list);
+    void drop_run(const KvoTokenList& list);
+
     std::istream& in;
-    const char* at;    ///< The next character in view.
-    const char* limit; ///< Behind the last one; equal to `at` if none is.
+    const char* at; ///< The next character in view.
+    // These stand between the two pointers for speed: side by side, they would
+    // be copied as one from the buffer's, of which one has just been written,
+    // and the processor would wait for that to reach the cache.
     Pending pending;
+    KvoTokenList::Run run; ///< What has been added to the list so far.
+    const char* limit;     ///< Behind the last one; equal to `at` if none is.
 };
 
 #endif

@@ -196,9 +196,7 @@ void ZtSoundControl::Play(KvoSound* sound)
         return;
     }
     OutputRate(sound->rate);
-    // At no rate nothing would ever leave the queue.
-    if (sound->rate > 0)
-        play_through(*port, *sound);
+    play_through(*port, *sound);
     port->release();
     AudioDevice::current().settle();
 }

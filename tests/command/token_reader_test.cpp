@@ -1,6 +1,7 @@
 #include "command/token_reader.h"
 
 #include <cstdio>
+#include <cstring>
 #include <fstream>
 #include <functional>
 #include <iostream>
@@ -30,7 +31,7 @@ public:
         const unsigned calm = Number(3) * Number(20) + 1;
         std::string text;
         while (text.size() < bytes) {
-            text += word(Number(8) == 0 ? Number(90) : Number(9) + 1);
+            text += word(Number(8) == 0 ? Number(90) : Number(10));
             text += Number(calm) ? ' ' : marks[dice() % marks.size()];
             if (Number(calm * 16) == 0)
                 text += static_cast<char>(dice() % 256);
@@ -211,6 +212,31 @@ TEST(KvoTokenReader, ReadsStatementsOfEveryKindOfStreamAsOneGetAtATimeWould)
         }
 }
 
+TEST(KvoTokenReader, ReadsListsOfEveryKindOfStreamAsOneGetAtATimeWould)
+{
+    const std::vector<std::pair<std::string, std::string>> punctuation = {
+        {"", ";"},     {"!", ";\n"},    {"/", ""},      {"", ""},
+        {":.", "\n"},  {"'\" ", "!"},   {",:", "\t\v"}, {"\"", "'"},
+        {"#", "\xff"}, {"aeiou", "!;"}, {"", " "},      {"\x01;", "\n"}};
+    RandomText texts;
+
+    for (const Kind& kind : kinds())
+        for (int round = 0; round < 250; ++round) {
+            const std::string text = texts.Of(texts.Number(600));
+            const auto tested = kind.make(text);
+            const auto reference = kind.make(text);
+            const auto& [special, end] =
+                punctuation[texts.Number(12)];
+
+            TokenizerDifference difference(*tested, *reference);
+
+            ASSERT_EQ(difference.OfLists(special, end, 1000), "")
+                << kind.name << ", " << testing::PrintToString(special) << ", "
+                << testing::PrintToString(end) << ", "
+                << testing::PrintToString(text);
+        }
+}
+
 TEST(KvoTokenReader, ReadsALargeFileAcrossAllBoundariesOfItsBuffer)
 {
     RandomText texts;
@@ -371,28 +397,26 @@ TEST(KvoTokenReader, ATokenReadInPiecesFromABrokenDeviceEndsThere)
     EXPECT_TRUE(in.bad());
 }
 
-TEST(OrdinaryRun, FindsTheSameEndsAsALookAtEachCharacter)
+TEST(OrdinaryRun, MapsBlanksAndStopsAsALookAtEachCharacterWould)
 {
-    const zt_command::Stops stops = {
-        {'!', '!', '!', '!', '!', '!', '!', '!', '!', '!', '!', '!', '!', '!',
-         '!', '!'},
-        {';', ';', ';', ';', ';', ';', ';', ';', ';', ';', ';', ';', ';', ';',
-         ';', ';'},
-        {'"', '"', '"', '"', '"', '"', '"', '"', '"', '"', '"', '"', '"', '"',
-         '"', '"'},
-        {'\xff', '\xff', '\xff', '\xff', '\xff', '\xff', '\xff', '\xff', '\xff',
-         '\xff', '\xff', '\xff', '\xff', '\xff', '\xff', '\xff'}};
+    zt_command::Stops stops;
+    const char given[] = {'!', '\n', '\xff'};
+    for (int i = 0; i < zt_command::given_stops; ++i)
+        std::memset(stops[i], given[i], sizeof stops[i]);
 
     for (int code = 0; code < 256; ++code)
         for (int place = 0; place < zt_command::block_bytes; ++place) {
             std::string block(zt_command::block_bytes, 'x');
             block[static_cast<std::size_t>(place)] = static_cast<char>(code);
-            const bool ends = code <= ' ' || code == '"' || code == '\'' ||
-                              code == '\\' || code == '!' || code == ';' ||
-                              code == 255;
+            const bool stop = code == '"' || code == '\'' || code == '\\' ||
+                              code == '!' || code == '\n' || code == 255;
+            const std::uint64_t here = std::uint64_t{1} << place;
 
-            EXPECT_EQ(zt_command::ends_in_block(block.data(), stops),
-                      ends ? std::uint64_t{1} << place : 0)
+            const zt_command::BlockMap map =
+                zt_command::map_of_block(block.data(), stops);
+
+            EXPECT_EQ(map.stops, stop ? here : 0) << code << " at " << place;
+            EXPECT_EQ(map.blanks, code <= ' ' && !stop ? here : 0)
                 << code << " at " << place;
         }
 }

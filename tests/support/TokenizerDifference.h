@@ -35,6 +35,22 @@ public:
         return difference;
     }
 
+    /// Reads up to `most` lists, all into the same one.
+    std::string OfLists(const std::string& special, const std::string& end,
+                        int most)
+    {
+        const LiteralTokenizer literal(special, end);
+        KvoTokenList list(special.c_str(), end.c_str());
+        for (int i = 0; i < most && difference.empty() && tested.good(); ++i) {
+            std::vector<LiteralToken> expected;
+            literal.AppendList(reference, expected);
+            list.Read(tested);
+            compare(list, expected);
+            compare_streams();
+        }
+        return difference;
+    }
+
     /// Reads up to `most` statements, and compares what is left.
     std::string OfStatements(int most)
     {
@@ -44,11 +60,7 @@ public:
             std::vector<LiteralToken> expected;
             literal.AppendStatement(reference, expected);
             statement.Read(tested);
-            if (statement.Count() != static_cast<int>(expected.size()))
-                note("count", statement.Count(), expected.size());
-            for (int k = 0; k < statement.Count() && difference.empty(); ++k)
-                compare(*statement.Find(k),
-                        expected[static_cast<std::size_t>(k)]);
+            compare(statement, expected);
             compare_streams();
         }
         if (difference.empty() && RestOf(tested) != RestOf(reference))
@@ -57,6 +69,15 @@ public:
     }
 
 private:
+    void compare(const KvoTokenList& list,
+                 const std::vector<LiteralToken>& expected)
+    {
+        if (list.Count() != static_cast<int>(expected.size()))
+            note("count", list.Count(), expected.size());
+        for (int i = 0; i < list.Count() && difference.empty(); ++i)
+            compare(*list.Find(i), expected[static_cast<std::size_t>(i)]);
+    }
+
     void compare(const KvoToken& token, const LiteralToken& expected)
     {
         // Texts are C strings: what stands behind a NUL does not show.
