@@ -1,5 +1,7 @@
 #include "ZT/plug.h"
 
+#include <dlfcn.h>
+
 #include <gtest/gtest.h>
 
 #include "env/plugin_tests.h"
@@ -409,6 +411,37 @@ TEST(ZtPlugCatalog, APlugInThatScansItsOwnDirectoryIsNotEnteredAgain)
 
     EXPECT_EQ(scan.catalog.Names(), (Names{"after", "before", "good"}));
     EXPECT_EQ(scan.errors, "");
+}
+
+TEST(ZtPlugCatalog, PlugInsThatScanOneAnotherAreNotEnteredAgain)
+{
+    PluginDir dir("scans_again");
+    dir.Add("scans_again", "second.t.so");
+    dir.Add("scans_again", "third.t.so");
+    SetVariable where("ZT_TEST_INNER_DIRECTORY", dir.Dir().c_str());
+    SetVariable trace("ZT_PLUGIN_TRACE", "1");
+
+    Scan scan(dir);
+
+    EXPECT_EQ(scan.catalog.Names(), (Names{"after", "before"}));
+    // Every scan comes upon every plug-in whose entry it runs in: one scan in
+    // one entry, and two in two, for each of three, and so on.
+    const std::string running = ": its entry is running\n";
+    std::size_t refusals = 0;
+    for (std::size_t at = 0;
+         (at = scan.errors.find(running, at)) != std::string::npos; ++at)
+        ++refusals;
+    EXPECT_EQ(refusals, 3U * 1 + 6U * 2 + 6U * 3);
+}
+
+TEST(ZtPlugCatalog, KeepsThePlugInsSymbolsFromOneAnother)
+{
+    const PluginDir dir("good");
+
+    const Scan scan(dir);
+
+    EXPECT_TRUE(IsLoaded(dir.Path("good.t.so")));
+    EXPECT_EQ(dlsym(RTLD_DEFAULT, "KvoPluginIDString"), nullptr);
 }
 
 TEST(ZtPlugCatalog, TakesNamesOfAnyLength)
