@@ -9,7 +9,6 @@
 
 #include <cmath>
 #include <cstddef>
-#include <cstdio>
 #include <cstring>
 #include <random>
 #include <vector>
@@ -31,6 +30,8 @@
 
 #include "KVO/KvoVec.h"
 #include "geometry/literal.h"
+#include "geometry/samples.h"
+#include "require.h"
 
 namespace {
 constexpr std::size_t few = 64;
@@ -230,39 +231,38 @@ void register_peers()
 #endif
 }
 
-template <class Value>
-bool same(const Value& ours, const Value& theirs)
-{
-    return std::memcmp(&ours, &theirs, sizeof ours) == 0;
-}
-
 /// A time is worth nothing if the bits are not those of the formula.
-bool all_bits_agree()
+void require_the_same_bits()
 {
-    const auto m = values<KvoMat>(few, 1);
-    const auto n = values<KvoMat>(few, 2);
-    const auto p = values<KvoVec4>(few, 1);
-    const auto a = values<KvoQuat>(few, 1, true);
-    const auto b = values<KvoQuat>(few, 2, true);
-    std::vector<KvoVec4> results(few);
-    n[0].Transform(p.data(), results.data(), few);
-    for (std::size_t i = 0; i < few; ++i)
-        if (!same(m[i] * n[i], literal::product(m[i], n[i])) ||
-            !same(m[i].Invert(), literal::inverse(m[i])) ||
-            !same(p[i] * m[i], literal::row_times(p[i], m[i])) ||
-            !same(results[i], literal::row_times(p[i], n[0])) ||
-            !same(our_slerp(a[i], b[i]), literal_slerp(a[i], b[i])))
-            return false;
-    return true;
+    constexpr std::size_t count = 10000;
+    const auto m = values<KvoMat>(count, 1);
+    const auto n = values<KvoMat>(count, 2);
+    const auto p = values<KvoVec4>(count, 3);
+    const auto a = values<KvoQuat>(count, 1, true);
+    const auto b = values<KvoQuat>(count, 2, true);
+    std::vector<KvoVec4> all(count);
+    for (std::size_t i = 0; i < count; ++i) {
+        Require(SameBits(our_product(m[i], n[i]), literal::product(m[i], n[i])),
+                "matrix product");
+        Require(SameBits(our_inverse(m[i], m[i]), literal::inverse(m[i])),
+                "inverse");
+        Require(SameBits(our_point(p[i], m[i]), literal::row_times(p[i], m[i])),
+                "row vector times matrix");
+        Require(SameBits(our_slerp(a[i], b[i]), literal_slerp(a[i], b[i])),
+                "slerp");
+    }
+    for (const KvoMat& matrix : {m[0], m[1], n[0], n[1]}) {
+        matrix.Transform(p.data(), all.data(), count);
+        for (std::size_t i = 0; i < count; ++i)
+            Require(SameBits(all[i], literal::row_times(p[i], matrix)),
+                    "many points");
+    }
 }
 } // namespace
 
 int main(int argc, char** argv)
 {
-    if (!all_bits_agree()) {
-        std::fputs("ours and the literal version differ\n", stderr);
-        return 1;
-    }
+    require_the_same_bits();
     register_ours();
     register_peers();
     benchmark::Initialize(&argc, argv);

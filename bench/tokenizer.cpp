@@ -5,11 +5,13 @@
 // strings and vectors, and on the library's own arrays, which grow by one, with
 // a new object for each token.
 
+#include <cctype>
 #include <cstdlib>
 #include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <random>
+#include <set>
 #include <sstream>
 #include <string>
 #include <strings.h>
@@ -22,6 +24,7 @@
 
 #include "KVO/KvoStatement.h"
 #include "ZT/directive.h"
+#include "ZT/error.h"
 #include "require.h"
 #include "support/LiteralTokenizer.h"
 
@@ -190,7 +193,7 @@ void read_all(std::istream& in)
     }
 }
 
-/// Compares the texts of the first megabyte with the literal reader's.
+/// Compares the tokens of the first megabyte with the literal reader's.
 void require_same_tokens()
 {
     const std::string text = script().substr(0, 1'000'000);
@@ -206,8 +209,9 @@ void require_same_tokens()
         bool same =
             static_cast<std::size_t>(statement.Count()) == literal.size();
         for (int i = 0; same && i < statement.Count(); ++i)
-            same = literal[static_cast<std::size_t>(i)].text ==
-                   statement.ArgText(i);
+            same =
+                literal[static_cast<std::size_t>(i)] ==
+                LiteralToken{statement.ArgText(i), statement.Find(i)->Quote()};
         Require(same, "statements");
     }
 }
@@ -312,34 +316,129 @@ private:
     std::size_t next = 0;
 };
 
-class LiteralDirective : public ZtDirective
+template <class Directive>
+class LiteralDirective : public Directive
 {
 public:
-    using ZtDirective::ZtDirective;
+    using Directive::Directive;
     int Compare(void* key) override
     {
-        return strcasecmp(name, static_cast<const char*>(key));
+        return strcasecmp(this->name, static_cast<const char*>(key));
     }
 };
 
+void delegate_literally(KvoSkipList& directives, KvoStatement& statement)
+{
+    if (KvoObject* found = directives.Search(statement.ArgText(0)))
+        static_cast<ZtDirective*>(found)->Act(&statement);
+}
+
+/// Notes what it was called for.
+class NotingDirector : public ZtDirector
+{
+public:
+    struct Call
+    {
+        const KvoStatement* statement = nullptr;
+        int selector = -1;
+        bool operator==(const Call&) const = default;
+    };
+
+    using ZtDirector::ZtDirector;
+    void Act(KvoStatement* statement, int selector) override
+    {
+        calls.push_back({statement, selector});
+    }
+
+    std::vector<Call> calls;
+};
+
+/// Keeps what is posted.
+class Reader : public ZtErrHandler
+{
+public:
+    void Handle(ZtErr* error) override
+    {
+        text += error->Message();
+        delete error;
+    }
+
+    std::string text;
+};
+
+/// Every word as it is, in capitals, in small letters, cut short, made longer.
+std::vector<std::string> words_to_try(const std::vector<std::string>& known)
+{
+    std::vector<std::string> words = {"", "e", "frobnicate", "\xE9"};
+    for (const std::string& word : known) {
+        std::string capitals, small;
+        for (const char c : word) {
+            capitals += static_cast<char>(std::toupper(c));
+            small += static_cast<char>(std::tolower(c));
+        }
+        words.insert(words.end(),
+                     {word, capitals, small, word + "0",
+                      word.substr(0, word.size() - 1), word.substr(0, 3)});
+    }
+    return words;
+}
+
+/// Compares which directives are called, and with which statement, or that an
+/// unknown word is reported: twice over, since a dispatcher looks for the first
+/// words in another way than for those after them. Once for each number of
+/// directives.
+void require_same_calls(std::int64_t count)
+{
+    static std::set<std::int64_t> agreed;
+    if (!agreed.insert(count).second)
+        return;
+    srandom(1);
+    ZtDispatcher dispatcher;
+    NotingDirector ours(dispatcher), literal(dispatcher);
+    KvoSkipList directives;
+    const std::vector<std::string> known = command_words(count);
+    for (int i = 0; i < static_cast<int>(known.size()); ++i) {
+        const char* word = known[static_cast<std::size_t>(i)].c_str();
+        ours.AddDirective(i, word);
+        directives.Insert(
+            new LiteralDirective<ZtDirector::Directive>(word, literal, i));
+    }
+    Reader reports;
+    for (int round = 0; round < 2; ++round)
+        for (const std::string& word : words_to_try(known)) {
+            KvoStatement statement(word.c_str());
+            ours.calls.clear();
+            literal.calls.clear();
+            reports.text.clear();
+            dispatcher.Delegate(&statement);
+            delegate_literally(directives, statement);
+            const std::string report =
+                literal.calls.empty()
+                    ? "Warning: Unknown command: " + word + "\n"
+                    : "";
+            Require(ours.calls == literal.calls && reports.text == report,
+                    "dispatch");
+        }
+    directives.DeleteContents();
+}
+
 void dispatch_literally(benchmark::State& state)
 {
+    require_same_calls(state.range(0));
     srandom(1);
     KvoSkipList directives;
     for (const std::string& word : command_words(state.range(0)))
-        directives.Insert(new LiteralDirective(word.c_str()));
+        directives.Insert(new LiteralDirective<ZtDirective>(word.c_str()));
     Commands commands(state.range(0));
-    for (auto _ : state) {
-        KvoStatement& statement = commands.Next();
-        KvoObject* found = directives.Search(statement.ArgText(0));
-        static_cast<ZtDirective*>(found)->Act(&statement);
-    }
+    for (auto _ : state)
+        delegate_literally(directives, commands.Next());
     directives.DeleteContents();
 }
 BENCHMARK(dispatch_literally)->Name("dispatch/literal")->Arg(200);
 
 void dispatch(benchmark::State& state)
 {
+    require_same_calls(state.range(0));
     srandom(1);
     ZtDispatcher dispatcher;
     for (const std::string& word : command_words(state.range(0)))
