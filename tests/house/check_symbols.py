@@ -22,7 +22,8 @@ PUBLIC = re.compile(
     r"|^operator[^\w(]+\((std::[io]stream&, )?Kvo"
     r"|^zt_geometry::(illegal_|division_by_)")
 # Templates of the standard library that the compiler puts into objects.
-STANDARD = re.compile(r"^((\w+ )*for )?[\w:<>*&, ]*(std::|__gnu_cxx::)")
+STANDARD = re.compile(r"^((\w+ )*for )?([\w:<>*&, ]|decltype\(nullptr\))*"
+                      r"(std::|__gnu_cxx::)")
 
 
 def output_of(*command):
