@@ -126,7 +126,8 @@ struct Place
 };
 
 /// Looks for a key's place; `order(node)` compares a node with the key. No node
-/// is compared twice: a level stops at the node that stopped the one above.
+/// is compared twice: a level stops at the node that stopped the one above,
+/// which every level below holds too, or at the end.
 ///
 /// `update` gets the last node before the key on each level, or the header.
 template <class Node, class Order>
@@ -137,17 +138,17 @@ Place<Node> walk(Node* header, int levels, Node** update, const Order& order)
     bool equal = false;
     for (int i = levels - 1; i >= 0; --i) {
         Node* next = forwards_behind(node)[i];
-        while (next && next != stopped) {
+        while (next != stopped) {
             fetch_ahead(node, next, i);
             const int side = order(next);
             if (side >= 0) {
                 equal = side == 0;
+                stopped = next;
                 break;
             }
             node = next;
             next = forwards_behind(node)[i];
         }
-        stopped = next;
         update[i] = node;
     }
     return {node, stopped, equal};
