@@ -11,27 +11,16 @@
 /// behind.
 ///
 /// A walk is bound by the memory it waits for: a node, its object and whatever
-/// the object's key is. So a node's forwards lie right behind it, nodes lie
-/// close together in slabs, and what can be asked next is fetched while the
-/// present object is compared.
-///
-/// A node has three members: what it holds, `forward` and `level`.
+/// the object's key is. So what can be asked next is fetched while the present
+/// object is compared; `node_store.h` keeps the nodes close together.
 
 #include <algorithm>
 #include <bit>
-#include <cstddef>
-#include <new>
 
-#include "core/slab.h"
+#include "core/node_store.h"
 #include "platform/random.h"
 
 namespace zt_core {
-template <class Node>
-Node** forwards_behind(Node* node)
-{
-    return reinterpret_cast<Node**>(node + 1);
-}
-
 /// Gives what `node` holds, whatever that member is called.
 template <class Node>
 const void* held_by(const Node* node)
@@ -39,54 +28,6 @@ const void* held_by(const Node* node)
     const auto& [held, forward, level] = *node;
     return held;
 }
-
-/// The nodes that wait to be used again; those of all lists of a class.
-template <class Node, int max_levels>
-class NodeStore
-{
-public:
-    NodeStore() = delete;
-
-    /// Gives a node of the height `level`, its forwards unset.
-    ///
-    /// Returns: null when memory runs out.
-    template <class Held>
-    static Node* take(int level, Held* held)
-    {
-        void* piece = spare[level];
-        if (piece)
-            spare[level] = spare[level]->forward[0];
-        else if (pieces_are_separate)
-            piece = ::operator new(bytes(level), std::nothrow);
-        else
-            piece = Slab::carve(bytes(level));
-        if (!piece)
-            return nullptr;
-        auto* node = static_cast<Node*>(piece);
-        *node = {held, forwards_behind(node), level};
-        return node;
-    }
-
-    static void give_back(Node* node)
-    {
-        if (pieces_are_separate) {
-            ::operator delete(node);
-            return;
-        }
-        node->forward[0] = spare[node->level];
-        spare[node->level] = node;
-    }
-
-private:
-    static std::size_t bytes(int level)
-    {
-        return sizeof(Node) +
-               static_cast<std::size_t>(level + 1) * sizeof(Node*);
-    }
-
-    // By level, chained by `forward[0]`.
-    static constinit inline Node* spare[max_levels] = {};
-};
 
 /// Draws the height of a new node: one less than the number of low one bits.
 inline int random_level()

@@ -49,6 +49,15 @@ public:
         return piece;
     }
 
+    static constexpr std::size_t block_bytes = std::size_t{64} << 10;
+
+    /// Cuts a block of `block_bytes` that is aligned to its size, so that a
+    /// piece of it leads to its beginning.
+    ///
+    /// Owner:   the process.
+    /// Returns: null when memory runs out.
+    static void* cut_block();
+
 private:
     static bool renew();
 

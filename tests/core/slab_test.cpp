@@ -1,6 +1,7 @@
 #include "core/slab.h"
 
 #include <array>
+#include <cstdint>
 #include <cstring>
 #include <set>
 
@@ -24,6 +25,19 @@ char* Carve()
     if (piece)
         pieces.at(count++) = piece;
     return static_cast<char*>(piece);
+}
+
+/// Cuts a block, writes to all of it, and remembers it likewise.
+char* CutAndFill()
+{
+    static constinit std::array<void*, 2000> blocks = {};
+    static constinit std::size_t count = 0;
+    void* const block = Slab::cut_block();
+    if (!block)
+        return nullptr;
+    std::memset(block, 1, Slab::block_bytes);
+    blocks.at(count++) = block;
+    return static_cast<char*>(block);
 }
 
 /// Carves so much that the slabs have begun to grow.
@@ -77,4 +91,33 @@ TEST(Slab, GivesNothingWithoutMemoryAndGoesOnAfterwards)
     }
 
     EXPECT_NE(Carve(), nullptr);
+}
+
+TEST(Slab, BlocksAreAlignedAndLieApart)
+{
+    std::set<char*> blocks;
+
+    for (int i = 0; i < 100; ++i)
+        blocks.insert(CutAndFill());
+
+    ASSERT_EQ(blocks.size(), 100u);
+    const char* end = nullptr;
+    for (const char* block : blocks) {
+        EXPECT_EQ(reinterpret_cast<std::uintptr_t>(block) % Slab::block_bytes,
+                  0u);
+        EXPECT_TRUE(!end || block >= end);
+        end = block + Slab::block_bytes;
+    }
+}
+
+TEST(Slab, GivesNoBlockWithoutMemoryAndGoesOnAfterwards)
+{
+    {
+        FailingMemory none;
+        while (CutAndFill()) {
+        }
+        EXPECT_TRUE(FailingMemory::Failed());
+    }
+
+    EXPECT_NE(CutAndFill(), nullptr);
 }
