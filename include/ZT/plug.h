@@ -41,7 +41,8 @@ ZT_API void KvoInitializePlugin(ZtPlugCatalog* catalog);
     extern "C" {                                                               \
     ZT_API const char* KvoPluginIDString = (id);                               \
     }                                                                          \
-    extern "C" ZT_API void KvoInitializePlugin(ZtPlugCatalog* catalog)
+    extern "C" ZT_API void KvoInitializePlugin(                                \
+        ZtPlugCatalog* catalog) // NOLINT(bugprone-macro-parentheses): a name
 
 /// Finds plug-ins of one kind, keeps them loaded and answers for the named
 /// objects, the plugs, that they brought.
