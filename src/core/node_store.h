@@ -86,7 +86,8 @@ private:
     static Block* block_of(Node* node)
     {
         const auto place = reinterpret_cast<std::uintptr_t>(node);
-        return reinterpret_cast<Block*>(place - place % Slab::block_bytes);
+        char* begin = reinterpret_cast<char*>(node) - place % Slab::block_bytes;
+        return reinterpret_cast<Block*>(begin);
     }
 
     static void spare(Block* block, Node* node)
