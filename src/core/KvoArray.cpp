@@ -7,6 +7,8 @@
 #include <cstring>
 #include <utility>
 
+#include "platform/large_memory.h"
+
 namespace {
 /// Tells whether so many elements may be asked of the system at all.
 bool can_be_asked_for(int count, int element_bytes)
@@ -97,7 +99,10 @@ void KvoArray::Allocate(int new_capacity)
     const int kept = held();
     data = block;
     capacity = new_capacity;
-    ZeroElements(data, kept, capacity - kept);
+    if (kept < capacity)
+        zt_platform::clear_new_memory(static_cast<char*>(data) +
+                                          bytes_of(kept, elementSize),
+                                      bytes_of(capacity - kept, elementSize));
 }
 
 void KvoArray::CopyElements(void* to, const void* from, int to_index,

@@ -6,7 +6,8 @@
 /// end to the other.
 ///
 /// The first touch of each page costs more than what is written there; large
-/// blocks are put on the largest pages the system has.
+/// blocks are put on the largest pages the system has, and those that must stay
+/// on small ones get them many at a time.
 
 #include <cstddef>
 
@@ -22,6 +23,12 @@ void* new_large_block(std::size_t bytes);
 ///
 /// Requires: that nothing was written to the block yet, or it gains little.
 void prefer_large_pages(void* block, std::size_t bytes);
+
+/// Clears memory that was just obtained.
+///
+/// Its pages are asked for many at a time: the system takes longer to be told
+/// of each first touch than to provide the page.
+void clear_new_memory(void* begin, std::size_t bytes);
 
 } // namespace zt_platform
 

@@ -562,3 +562,18 @@ TEST(KvoArray, AppendingElementsOfAnotherSizeFitsEachOne)
     EXPECT_EQ(pairs.size, 3);
     EXPECT_EQ(std::string(static_cast<char*>(pairs.data), 6), "xXabde");
 }
+
+TEST(KvoArray, ALargeBlockKeepsItsElementsAndReadsAsZeroBehindThem)
+{
+    KvoIntArray array(100000);
+    for (int i = 0; i < array.size; ++i)
+        array[i] = i + 1;
+
+    array.BumpSize(1000000);
+    array.SetSize(700000);
+    array.Allocate(900000);
+
+    const int* elements = static_cast<const int*>(array.data);
+    for (int i = 0; i < 900000; ++i)
+        ASSERT_EQ(elements[i], i < 100000 ? i + 1 : 0) << i;
+}

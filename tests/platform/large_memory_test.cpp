@@ -1,5 +1,6 @@
 #include "platform/large_memory.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdint>
 #include <cstdlib>
@@ -8,6 +9,7 @@
 #include <sstream>
 #include <string>
 #include <sys/mman.h>
+#include <vector>
 
 #include <gtest/gtest.h>
 
@@ -92,6 +94,26 @@ TEST(large_memory, RefusedAdviceLeavesTheLastFailureAlone)
     zt_platform::prefer_large_pages(gone, bytes);
 
     EXPECT_EQ(errno, 0);
+}
+
+TEST(large_memory, NewMemoryOfAnySizeIsClearedAndNothingBesideIt)
+{
+    for (std::size_t bytes :
+         {std::size_t{0}, std::size_t{1}, std::size_t{100},
+          (std::size_t{256} << 10) - 1, std::size_t{256} << 10,
+          (std::size_t{3} << 20) + 5}) {
+        std::vector<char> block(7 + bytes + 1, 'x');
+
+        errno = EDOM;
+        zt_platform::clear_new_memory(block.data() + 7, bytes);
+
+        EXPECT_EQ(errno, EDOM);
+        EXPECT_EQ(std::count(block.begin(), block.begin() + 7, 'x'), 7);
+        EXPECT_EQ(static_cast<std::size_t>(
+                      std::count(block.begin(), block.end(), '\0')),
+                  bytes);
+        EXPECT_EQ(block.back(), 'x');
+    }
 }
 
 } // namespace
