@@ -19,7 +19,7 @@ class FileWindow
 {
 public:
     /// Bytes behind every stretch that may be read and are of no meaning.
-    static constexpr std::size_t slack = 32;
+    static constexpr std::size_t slack = 128;
 
     /// Requires: `whole_file` outlives the window.
     explicit FileWindow(const zt_platform::InputFile& whole_file);

@@ -1,19 +1,23 @@
 #include "image/pixel_rows.h"
 
-#include "platform/pixel_lanes.h"
-
 namespace zt_image {
 
 using zt_platform::PixelLanes;
 
-void join_channels(const ChannelRows& rows, std::size_t count,
-                   ChannelOrder order, ZtPixel* pixels)
+zt_platform::Joining joining_of(const ChannelRows& rows, std::size_t count,
+                                ChannelOrder order, ZtPixel* pixels)
 {
     const auto& of = rows.channel;
     if (order == ChannelOrder::Codec)
-        PixelLanes::current().join({of[0], of[1], of[2], of[3]}, pixels, count);
-    else
-        PixelLanes::current().join({of[3], of[2], of[1], of[0]}, pixels, count);
+        return {{of[0], of[1], of[2], of[3]}, pixels, count};
+    return {{of[3], of[2], of[1], of[0]}, pixels, count};
+}
+
+void join_channels(const ChannelRows& rows, std::size_t count,
+                   ChannelOrder order, ZtPixel* pixels)
+{
+    zt_platform::Joining joining = joining_of(rows, count, order, pixels);
+    PixelLanes::current().join(joining.bytes, joining.words, joining.count);
 }
 
 void take_channels(const ZtPixel* pixels, std::size_t count, ChannelOrder order,

@@ -5,6 +5,7 @@
 /// Rows of pixels and the rows of channel values that they are made of.
 
 #include "image/picture.h"
+#include "platform/pixel_lanes.h"
 
 #include <cstddef>
 
@@ -15,6 +16,10 @@ struct ChannelRows
 {
     const unsigned char* channel[4];
 };
+
+/// Gives the four rows in the order of a pixel's bytes.
+zt_platform::Joining joining_of(const ChannelRows& rows, std::size_t count,
+                                ChannelOrder order, ZtPixel* pixels);
 
 /// Makes `count` pixels of the four rows.
 void join_channels(const ChannelRows& rows, std::size_t count,

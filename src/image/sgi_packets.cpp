@@ -11,8 +11,8 @@ namespace {
 
 using zt_platform::PixelLanes;
 
-constexpr unsigned literal_bit = 0x80;
-constexpr unsigned count_bits = 0x7F;
+constexpr unsigned literal_bit = zt_platform::PackedRow::literal_bit;
+constexpr unsigned count_bits = zt_platform::PackedRow::count_bits;
 constexpr std::size_t most_in_a_packet = 126;
 
 /// Copies a literal in whole blocks, past its end, which is why both sides
@@ -23,16 +23,6 @@ void copy_values(unsigned char* to, const unsigned char* from,
     std::size_t done = 0;
     do {
         std::memcpy(to + done, from + done, packet_slack);
-        done += packet_slack;
-    } while (done < count);
-}
-
-/// Fills with a repeated value in whole blocks, past the end.
-void fill_values(unsigned char* to, unsigned char value, std::size_t count)
-{
-    std::size_t done = 0;
-    do {
-        std::memset(to + done, value, packet_slack);
         done += packet_slack;
     } while (done < count);
 }
@@ -125,31 +115,6 @@ unsigned char* put_repeats(unsigned char value, std::size_t count,
 }
 
 } // namespace
-
-bool expand_exact_row(const unsigned char* packets,
-                      const unsigned char* packets_end, unsigned char* values,
-                      std::size_t width)
-{
-    std::size_t left = width;
-    while (packets < packets_end) {
-        unsigned packet = *packets++;
-        std::size_t count = packet & count_bits;
-        if (count == 0)
-            break;
-        std::size_t needed = packet & literal_bit ? count : 1;
-        if (count > left ||
-            needed > static_cast<std::size_t>(packets_end - packets))
-            return false;
-        if (packet & literal_bit)
-            copy_values(values, packets, count);
-        else
-            fill_values(values, *packets, count);
-        packets += needed;
-        values += count;
-        left -= count;
-    }
-    return left == 0;
-}
 
 void expand_row(const unsigned char* packets, const unsigned char* packets_end,
                 ZtPixel* pixels, const ZtPixel* pixels_end, int shift)

@@ -4,9 +4,8 @@
 /// \file
 /// The packets of a compressed row, from bytes to channel values and back.
 ///
-/// A packet begins with a byte that holds a count in its low seven bits. With
-/// the high bit that many values follow; without it one value follows that
-/// stands for as many. Count 0 ends the row.
+/// What a packet is, `zt_platform::PackedRow` says, which rows that fill their
+/// width exactly are read through.
 
 #include <ZT/image_sgi.h>
 
@@ -14,17 +13,8 @@
 
 namespace zt_image {
 
-/// Bytes behind a row of channel values that `expand_exact_row` may write to.
+/// Bytes behind packets and values that `compress_row` may touch.
 constexpr std::size_t packet_slack = 32;
-
-/// Expands a row that fills its `width` values exactly, as nearly all do.
-///
-/// Requires: `packet_slack` bytes behind `packets_end` that may be read and
-///           behind `values + width` that may be written.
-/// Returns:  false as soon as the row turns out to be longer or shorter.
-bool expand_exact_row(const unsigned char* packets,
-                      const unsigned char* packets_end, unsigned char* values,
-                      std::size_t width);
 
 /// Expands a row of any kind into one channel of the pixels from `pixels` on.
 ///

@@ -12,8 +12,8 @@
 #include <cstring>
 
 // Most files hold rows that fill their width exactly, in whatever order they
-// lie: such a row is expanded channel by channel into bytes, and its channels
-// are joined into pixels while they are at hand. As soon as one row is longer
+// lie: the channels of such a row are unpacked into bytes, and while those of
+// the next row are, they are joined into pixels. As soon as one row is longer
 // or shorter, the file is read anew, row after row into the cleared picture,
 // which decides what overlapping rows mean.
 
@@ -22,6 +22,9 @@ namespace zt_image {
 namespace {
 
 using zt_platform::InputFile;
+using zt_platform::Joining;
+using zt_platform::PackedRow;
+using zt_platform::PixelLanes;
 
 constexpr std::size_t most_channels = 4;
 
@@ -43,17 +46,19 @@ struct Reading
     }
 };
 
-/// Rows of channel values, one for each channel, and a row of opaque alpha.
+/// Two rows of channel values, one for each channel, and a row of opaque alpha.
 class PlaneRows
 {
 public:
     explicit PlaneRows(std::size_t width)
-        : stride(width + packet_slack),
+        : stride((width + PixelLanes::packet_slack + line - 1) / line * line),
           bytes(static_cast<unsigned char*>(
-              std::calloc(most_channels + 1, stride)))
+              std::aligned_alloc(line, planes * stride)))
     {
-        if (bytes)
-            std::memset(plane(most_channels), 0xFF, stride);
+        if (!bytes)
+            return;
+        std::memset(bytes, 0, planes * stride);
+        std::memset(plane(2, 0), 0xFF, stride);
     }
 
     ~PlaneRows() { std::free(bytes); }
@@ -61,13 +66,19 @@ public:
     PlaneRows& operator=(const PlaneRows&) = delete;
 
     bool made() const { return bytes != nullptr; }
-    unsigned char* plane(std::size_t channel)
+
+    /// Gives the room of a channel in either row.
+    unsigned char* plane(std::size_t row, std::size_t channel)
     {
-        return bytes + channel * stride;
+        return bytes + (row * most_channels + channel) * stride;
     }
-    const unsigned char* opaque() { return plane(most_channels); }
+
+    const unsigned char* opaque() { return plane(2, 0); }
 
 private:
+    static constexpr std::size_t line = 64; ///< Bytes of the fastest access.
+    static constexpr std::size_t planes = 2 * most_channels + 1;
+
     std::size_t stride;
     unsigned char* bytes;
 };
@@ -82,35 +93,122 @@ ChannelRows complete(const unsigned char* const (&planes)[most_channels],
     return {{planes[0], planes[1], planes[2], zsize == 3 ? opaque : planes[3]}};
 }
 
+static_assert(FileWindow::slack >= PixelLanes::packet_slack);
+
+/// Where the packets of the rows come from.
+class PacketSource
+{
+public:
+    PacketSource(const Reading& picture, const SgiRowTable& rows)
+        : reading(picture), table(rows), windows{FileWindow(picture.file),
+                                                 FileWindow(picture.file),
+                                                 FileWindow(picture.file),
+                                                 FileWindow(picture.file)}
+    {}
+
+    /// Finds the packets of each channel of a row; they stay until the next
+    /// row is asked for.
+    ///
+    /// Channels that follow one another, as in most files, are read at once.
+    /// Otherwise the file most likely goes channel by channel.
+    ///
+    /// Returns: false for lack of memory.
+    bool find(std::size_t y, PackedRow (&rows)[most_channels])
+    {
+        std::uint64_t begin = ~std::uint64_t{0};
+        std::uint64_t end = 0;
+        for (std::size_t z = 0; z < reading.shown_channels(); ++z) {
+            begin = std::min<std::uint64_t>(begin, table.start(y, z));
+            end = std::max<std::uint64_t>(end, table.start(y, z) + bytes(y, z));
+        }
+        const std::size_t most =
+            most_channels * most_packet_bytes(reading.width());
+        const bool at_once = begin < end && end - begin <= most;
+        if (at_once && !windows[0].at(begin, end - begin))
+            return false;
+        for (std::size_t z = 0; z < reading.shown_channels(); ++z) {
+            const unsigned char* packets =
+                windows[at_once ? 0 : z].at(table.start(y, z), bytes(y, z));
+            if (!packets)
+                return false;
+            rows[z].packets = packets;
+            rows[z].packets_end = packets + bytes(y, z);
+        }
+        return true;
+    }
+
+    /// Guesses at the packets of a row by the bytes that they take.
+    PixelLanes::Packets packets(std::size_t y) const
+    {
+        const std::size_t channels = reading.shown_channels();
+        std::size_t all = 0;
+        for (std::size_t z = 0; z < channels; ++z)
+            all += bytes(y, z);
+        return all > channels * reading.width() / 2
+                   ? PixelLanes::Packets::Long
+                   : PixelLanes::Packets::Short;
+    }
+
+private:
+    std::size_t bytes(std::size_t y, std::size_t z) const
+    {
+        return std::min<std::size_t>(table.length(y, z),
+                                     most_packet_bytes(reading.width()));
+    }
+
+    const Reading& reading;
+    const SgiRowTable& table;
+    FileWindow windows[most_channels];
+};
+
+/// One of the two rows of a picture that are being read: first it is unpacked,
+/// then, while the next one is, it is joined.
+struct RowAtWork
+{
+    PackedRow packed[most_channels];
+    Joining joining;
+};
+
+/// Makes a row of these planes; packets and pixels are still to come.
+RowAtWork row_at_work(const Reading& reading, PlaneRows& rows, std::size_t row)
+{
+    unsigned char* const planes[most_channels] = {
+        rows.plane(row, 0), rows.plane(row, 1), rows.plane(row, 2),
+        rows.plane(row, 3)};
+    RowAtWork work = {};
+    work.joining =
+        joining_of(complete(planes, rows.opaque(), reading.header.zsize), 0,
+                   reading.order, nullptr);
+    for (std::size_t z = 0; z < reading.shown_channels(); ++z) {
+        work.packed[z].values = planes[z];
+        work.packed[z].values_end = planes[z] + reading.width();
+    }
+    return work;
+}
+
 /// Reads rows that all fill their width exactly.
 ///
 /// Returns: false when one does not, and for lack of memory.
-bool read_exact_rows(const Reading& reading, const SgiRowTable& table,
-                     bool in_order)
+bool read_exact_rows(const Reading& reading, const SgiRowTable& table)
 {
     PlaneRows rows(reading.width());
     if (!rows.made())
         return false;
-    // Rows that do not follow one another lie channel by channel, most likely.
-    FileWindow windows[most_channels] = {
-        FileWindow(reading.file), FileWindow(reading.file),
-        FileWindow(reading.file), FileWindow(reading.file)};
-    const unsigned char* const planes[most_channels] = {
-        rows.plane(0), rows.plane(1), rows.plane(2), rows.plane(3)};
-    ChannelRows row = complete(planes, rows.opaque(), reading.header.zsize);
+    const PixelLanes& lanes = PixelLanes::current();
+    PacketSource source(reading, table);
+    RowAtWork work[2] = {row_at_work(reading, rows, 0),
+                         row_at_work(reading, rows, 1)};
     for (std::size_t y = 0; y < reading.height(); ++y) {
-        for (std::size_t z = 0; z < reading.shown_channels(); ++z) {
-            std::size_t bytes = std::min<std::size_t>(
-                table.length(y, z), most_packet_bytes(reading.width()));
-            const unsigned char* packets =
-                windows[in_order ? 0 : z].at(table.start(y, z), bytes);
-            if (!packets || !expand_exact_row(packets, packets + bytes,
-                                              rows.plane(z), reading.width()))
-                return false;
-        }
-        join_channels(row, reading.width(), reading.order,
-                      reading.pixels + y * reading.width());
+        RowAtWork& row = work[y % 2];
+        const RowAtWork& before = work[1 - y % 2];
+        if (!source.find(y, row.packed) ||
+            !lanes.unpack(row.packed, source.packets(y), before.joining))
+            return false;
+        row.joining.words = reading.pixels + y * reading.width();
+        row.joining.count = reading.width();
     }
+    const Joining& last = work[(reading.height() + 1) % 2].joining;
+    lanes.join(last.bytes, last.words, last.count);
     return true;
 }
 
@@ -165,13 +263,12 @@ bool read_run_length(const Reading& reading)
     SgiRowTable table;
     if (!table.read(reading.file, reading.header))
         return false;
-    bool in_order = table.in_order();
-    if (!in_order && table.any_longer_than(row_bound(reading.width()))) {
+    if (!table.in_order() &&
+        table.any_longer_than(row_bound(reading.width()))) {
         overlong_row();
         return false;
     }
-    return read_exact_rows(reading, table, in_order) ||
-           read_any_rows(reading, table);
+    return read_exact_rows(reading, table) || read_any_rows(reading, table);
 }
 
 /// Reads the planes of a verbatim file, a row of each at a time.
@@ -185,8 +282,8 @@ bool read_verbatim(const Reading& reading)
     FileWindow windows[most_channels] = {
         FileWindow(reading.file), FileWindow(reading.file),
         FileWindow(reading.file), FileWindow(reading.file)};
-    const unsigned char* planes[most_channels] = {rows.plane(0), rows.plane(1),
-                                                  rows.plane(2), rows.plane(3)};
+    const unsigned char* planes[most_channels] = {
+        rows.plane(0, 0), rows.plane(0, 1), rows.plane(0, 2), rows.plane(0, 3)};
     for (std::size_t y = 0; y < reading.height(); ++y) {
         for (std::size_t z = 0; z < reading.shown_channels(); ++z) {
             std::uint64_t row = z * reading.height() + y;

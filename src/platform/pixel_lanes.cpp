@@ -1,6 +1,10 @@
 #include "platform/pixel_lanes.h"
 
+#include "platform/unpack_rows.h"
 #include "platform/x86/pixel_lanes_avx2.h"
+#include "platform/x86/pixel_lanes_avx512.h"
+
+#include <cstring>
 
 namespace zt_platform {
 
@@ -11,6 +15,36 @@ struct PlainLanes final : PixelLanes
 
 constinit const PlainLanes plain_lanes;
 constinit const PixelLanes* in_use = nullptr; ///< Null before the first use.
+
+/// Blocks of bytes: nearly every packet is done with the first.
+struct PlainWide
+{
+    static constexpr std::size_t block = 64;
+
+    static void copy(unsigned char* to, const unsigned char* from,
+                     std::size_t count)
+    {
+        for (std::size_t done = 0; done < count; done += bytes)
+            std::memcpy(to + done, from + done, bytes);
+    }
+
+    static void fill(unsigned char* to, unsigned char value, std::size_t count)
+    {
+        for (std::size_t done = 0; done < count; done += bytes)
+            std::memset(to + done, value, bytes);
+    }
+
+    static void join(const unsigned char* const (&rows)[4], std::size_t at,
+                     std::uint32_t* words)
+    {
+        plain_lanes.join(
+            {rows[0] + at, rows[1] + at, rows[2] + at, rows[3] + at}, words,
+            block);
+    }
+
+private:
+    static constexpr std::size_t bytes = 32;
+};
 
 } // namespace
 
@@ -27,6 +61,12 @@ void PixelLanes::join(const unsigned char* const (&bytes)[4],
                    static_cast<std::uint32_t>(bytes[1][i]) << 8 |
                    static_cast<std::uint32_t>(bytes[2][i]) << 16 |
                    static_cast<std::uint32_t>(bytes[3][i]) << 24;
+}
+
+bool PixelLanes::unpack(const PackedRow (&rows)[4], Packets packets,
+                        const Joining& beside) const
+{
+    return unpack_rows<PlainWide>(*this, rows, packets, beside);
 }
 
 void PixelLanes::split(const std::uint32_t* words,
@@ -110,6 +150,8 @@ const PixelLanes& PixelLanes::plain()
 
 const PixelLanes& PixelLanes::fastest()
 {
+    if (const PixelLanes* widest = avx512_pixel_lanes())
+        return *widest;
     const PixelLanes* wide = avx2_pixel_lanes();
     return wide ? *wide : plain_lanes;
 }

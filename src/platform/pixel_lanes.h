@@ -14,6 +14,31 @@
 
 namespace zt_platform {
 
+/// A row of bytes in packets, and where the bytes go.
+///
+/// A packet begins with a byte that holds a count in its low seven bits. With
+/// the high bit that many bytes follow; without it one byte follows that
+/// stands for as many. Count 0 ends the row.
+struct PackedRow
+{
+    const unsigned char* packets;
+    const unsigned char* packets_end;
+    unsigned char* values;
+    unsigned char* values_end;
+
+    static constexpr unsigned literal_bit = 0x80;
+    static constexpr unsigned count_bits = 0x7F;
+};
+
+/// Four rows of bytes that are to be joined into words; the first are the
+/// lowest.
+struct Joining
+{
+    const unsigned char* bytes[4];
+    std::uint32_t* words;
+    std::size_t count;
+};
+
 class PixelLanes
 {
 public:
@@ -23,6 +48,18 @@ public:
     /// Makes words of four rows of bytes; `bytes[0]` are the lowest.
     virtual void join(const unsigned char* const (&bytes)[4],
                       std::uint32_t* words, std::size_t count) const;
+
+    /// Unpacks four rows, and joins four others beside: unpacking waits for
+    /// one packet after the other, joining for memory.
+    ///
+    /// Requires: `packet_slack` bytes behind the packets that may be read and
+    ///           behind the values that may be written.
+    /// Returns:  whether the packets filled all of their rows exactly; if not,
+    ///           neither values nor words mean anything.
+    static constexpr std::size_t packet_slack = 128;
+    enum class Packets : int { Short = 0, Long = 1 }; ///< Most of them.
+    virtual bool unpack(const PackedRow (&rows)[4], Packets packets,
+                        const Joining& beside) const;
 
     /// Takes words apart into four rows of bytes; `bytes[0]` are the lowest.
     virtual void split(const std::uint32_t* words,

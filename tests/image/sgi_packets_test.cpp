@@ -8,6 +8,7 @@
 #include "image/pictures.h"
 #include "image/sgi_bytes.h"
 #include "image/sgi_header.h"
+#include "platform/pixel_lanes.h"
 
 namespace {
 
@@ -25,13 +26,21 @@ std::string Compressed(const std::string& values)
 /// Expands packets that are to fill a row exactly.
 bool ExpandsExactly(const std::string& packets, std::string& values)
 {
-    std::string padded = packets + Fill(zt_image::packet_slack, 0x55);
-    std::string out = Fill(values.size() + zt_image::packet_slack, 0xAA);
+    using zt_platform::PixelLanes;
+    std::string padded = packets + Fill(PixelLanes::packet_slack, 0x55);
+    std::string out = Fill(values.size() + PixelLanes::packet_slack, 0xAA);
     auto* begin = reinterpret_cast<const unsigned char*>(padded.data());
-    bool exact = zt_image::expand_exact_row(
-        begin, begin + packets.size(),
-        reinterpret_cast<unsigned char*>(out.data()), values.size());
-    values = out.substr(0, values.size());
+    auto* to = reinterpret_cast<unsigned char*>(out.data());
+    const zt_platform::PackedRow rows[4] = {
+        {begin, begin + packets.size(), to, to + values.size()}, {}, {}, {}};
+    bool exact = true;
+    for (PixelLanes::Packets guess :
+         {PixelLanes::Packets::Short, PixelLanes::Packets::Long}) {
+        exact = PixelLanes::current().unpack(rows, guess, {});
+        if (!exact)
+            break;
+        values = out.substr(0, values.size());
+    }
     return exact;
 }
 

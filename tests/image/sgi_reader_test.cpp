@@ -7,6 +7,8 @@
 #include "image/literal_codec.h"
 #include "image/pictures.h"
 #include "image/sgi_bytes.h"
+#include "platform/x86/pixel_lanes_avx2.h"
+#include "platform/x86/pixel_lanes_avx512.h"
 #include "support/FaultyFiles.h"
 #include "support/TempDir.h"
 
@@ -268,6 +270,55 @@ TEST(sgi_reader, RandomFilesAgreeWithAPlainReader)
         std::string file = literal::WriteSgi(pixels, width, height, channels);
 
         ASSERT_EQ(Read(file), literal::ReadSgi(file).pixels) << i;
+    }
+}
+
+/// Makes the rows of a picture with its bytes packed, some without the closing
+/// zero and some with junk behind them, which their lengths leave out.
+SgiRows PackedRows(std::mt19937& random, const SgiFields& fields,
+                   const PixelList& pixels)
+{
+    SgiRows packed;
+    for (unsigned channel = 0; channel < fields.channels; ++channel)
+        for (unsigned y = 0; y < fields.height; ++y) {
+            std::string values;
+            for (unsigned x = 0; x < fields.width; ++x)
+                values += static_cast<char>(pixels[y * fields.width + x] >>
+                                            8 * channel);
+            std::string row = literal::CompressRow(values);
+            if (random() % 4 == 0)
+                row.pop_back();
+            packed.lengths.emplace_back(packed.rows.size(), row.size());
+            if (random() % 8 == 0)
+                row += Fill(random() % 3000, 0x7F);
+            packed.rows.push_back(row);
+        }
+    return packed;
+}
+
+TEST(sgi_reader, WideRowsAgreeWithAPlainReaderOnAllLanes)
+{
+    using zt_platform::PixelLanes;
+    std::mt19937 random(6);
+    for (int i = 0; i < 200; ++i) {
+        SgiFields fields = {.width = static_cast<unsigned>(random() % 1500 + 1),
+                            .height = static_cast<unsigned>(random() % 9 + 1),
+                            .channels = static_cast<unsigned>(i % 4 + 1)};
+        PixelList pixels = RandomPicture(random, static_cast<int>(fields.width),
+                                         static_cast<int>(fields.height),
+                                         TextureNumber(i / 4));
+        SgiRows rows = PackedRows(random, fields, pixels);
+        rows.by_channel = random() % 2 == 0;
+        std::string file = SgiFile(fields, rows);
+        PixelList expected = literal::ReadSgi(file).pixels;
+
+        for (const PixelLanes* lanes :
+             {&PixelLanes::plain(), zt_platform::avx2_pixel_lanes(),
+              zt_platform::avx512_pixel_lanes()}) {
+            PixelLanes::install(lanes);
+            ASSERT_EQ(Read(file), expected) << i;
+        }
+        PixelLanes::install(nullptr);
     }
 }
 

@@ -6,13 +6,18 @@
 
 #include <gtest/gtest.h>
 
+#include "platform/x86/pixel_lanes_avx2.h"
+#include "platform/x86/pixel_lanes_avx512.h"
+
 namespace {
 
+using zt_platform::Joining;
+using zt_platform::PackedRow;
 using zt_platform::PixelLanes;
 using Words = std::vector<std::uint32_t>;
 using Bytes = std::vector<unsigned char>;
 
-/// Each test runs with the plain lanes and with the fastest.
+/// Each test runs with all the lanes that this processor has.
 class PixelLanesTest : public testing::TestWithParam<const PixelLanes*>
 {
 protected:
@@ -38,10 +43,20 @@ protected:
     }
 };
 
-INSTANTIATE_TEST_SUITE_P(Plain, PixelLanesTest,
-                         testing::Values(&PixelLanes::plain()));
-INSTANTIATE_TEST_SUITE_P(Fastest, PixelLanesTest,
-                         testing::Values(&PixelLanes::fastest()));
+std::vector<const PixelLanes*> AllLanes()
+{
+    std::vector<const PixelLanes*> all = {&PixelLanes::plain()};
+    for (const PixelLanes* lanes :
+         {zt_platform::avx2_pixel_lanes(), zt_platform::avx512_pixel_lanes()})
+        if (lanes)
+            all.push_back(lanes);
+    return all;
+}
+
+INSTANTIATE_TEST_SUITE_P(Lanes, PixelLanesTest, testing::ValuesIn(AllLanes()),
+                         [](const auto& about) {
+                             return std::string(about.param->name());
+                         });
 
 TEST_P(PixelLanesTest, WordsAreMadeOfBytesTheLowestFirst)
 {
@@ -62,6 +77,177 @@ TEST_P(PixelLanesTest, WordsAreMadeOfBytesTheLowestFirst)
             ASSERT_EQ(words[i], expected);
         }
         ASSERT_EQ(words[count], 0x01234567u);
+    }
+}
+
+/// A row in packets, with a buffer for what is in them, both with their slack.
+class Packed
+{
+public:
+    Packed(const Bytes& row_packets, std::size_t width)
+        : packets(row_packets), values(width + PixelLanes::packet_slack, 0xAA)
+    {
+        packets.insert(packets.end(), PixelLanes::packet_slack, 0x7F);
+    }
+
+    PackedRow Row()
+    {
+        return {packets.data(),
+                packets.data() + packets.size() - PixelLanes::packet_slack,
+                values.data(),
+                values.data() + values.size() - PixelLanes::packet_slack};
+    }
+
+    Bytes Values() const
+    {
+        return {values.begin(),
+                values.end() - static_cast<long>(PixelLanes::packet_slack)};
+    }
+
+private:
+    Bytes packets;
+    Bytes values;
+};
+
+constexpr PixelLanes::Packets guesses[] = {PixelLanes::Packets::Short,
+                                           PixelLanes::Packets::Long};
+
+/// Unpacks one row, first guessed at one way, then the other.
+testing::AssertionResult Unpacks(const PixelLanes& lanes, const Bytes& packets,
+                                 const Bytes& expected)
+{
+    for (PixelLanes::Packets guess : guesses)
+        for (std::size_t at = 0; at < 4; ++at) {
+            Packed packed(packets, expected.size());
+            PackedRow rows[4] = {};
+            rows[at] = packed.Row();
+            if (!lanes.unpack(rows, guess, {}))
+                return testing::AssertionFailure() << "is not exact";
+            if (packed.Values() != expected)
+                return testing::AssertionFailure() << "has other values";
+        }
+    return testing::AssertionSuccess();
+}
+
+bool IsExact(const PixelLanes& lanes, const Bytes& packets, std::size_t width)
+{
+    int exact = 0;
+    for (PixelLanes::Packets guess : guesses) {
+        Packed packed(packets, width);
+        const PackedRow rows[4] = {{}, packed.Row(), {}, {}};
+        exact += lanes.unpack(rows, guess, {});
+    }
+    EXPECT_NE(exact, 1);
+    return exact == 2;
+}
+
+TEST_P(PixelLanesTest, PacketsHoldLiteralsAndRepeats)
+{
+    EXPECT_TRUE(
+        Unpacks(lanes, {0x83, 1, 2, 3, 0x04, 9, 0x00}, {1, 2, 3, 9, 9, 9, 9}));
+    EXPECT_TRUE(Unpacks(lanes, {0x02, 5, 0x81, 6}, {5, 5, 6}));
+    EXPECT_TRUE(Unpacks(lanes, {0x00}, {}));
+    EXPECT_TRUE(Unpacks(lanes, {}, {}));
+}
+
+TEST_P(PixelLanesTest, PacketsOfEveryLengthAreUnpacked)
+{
+    for (unsigned count = 1; count < 128; ++count) {
+        Bytes literal = RandomBytes(count);
+        Bytes packets = {static_cast<unsigned char>(0x80 | count)};
+        packets.insert(packets.end(), literal.begin(), literal.end());
+        packets.insert(packets.end(),
+                       {static_cast<unsigned char>(count), 0x77, 0x00});
+        Bytes expected = literal;
+        expected.insert(expected.end(), count, 0x77);
+
+        EXPECT_TRUE(Unpacks(lanes, packets, expected)) << count;
+    }
+}
+
+TEST_P(PixelLanesTest, RowsThatAreTooLongOrTooShortAreNotExact)
+{
+    EXPECT_FALSE(IsExact(lanes, {0x03, 1, 0x00}, 4));
+    EXPECT_FALSE(IsExact(lanes, {0x05, 1, 0x00}, 4));
+    EXPECT_FALSE(IsExact(lanes, {0x04, 1, 0x01, 2}, 4));
+    EXPECT_FALSE(IsExact(lanes, {0x84, 1, 2, 3}, 4));
+    EXPECT_FALSE(IsExact(lanes, {0x04}, 4));
+    EXPECT_FALSE(IsExact(lanes, {0x02, 1, 0x00, 0x02, 1}, 4));
+    EXPECT_FALSE(IsExact(lanes, {0x02, 1, 0x80, 0x02, 1}, 4));
+    EXPECT_FALSE(IsExact(lanes, {}, 4));
+    EXPECT_FALSE(IsExact(lanes, {0x01, 1}, 0));
+}
+
+TEST_P(PixelLanesTest, OneRowThatIsNotExactIsEnough)
+{
+    for (PixelLanes::Packets guess : guesses)
+        for (std::size_t wrong = 0; wrong < 5; ++wrong) {
+            std::vector<Packed> packed;
+            PackedRow rows[4];
+            for (std::size_t i = 0; i < 4; ++i)
+                packed.emplace_back(Bytes{0x04, 1}, i == wrong ? 5 : 4);
+            for (std::size_t i = 0; i < 4; ++i)
+                rows[i] = packed[i].Row();
+
+            EXPECT_EQ(lanes.unpack(rows, guess, {}), wrong == 4);
+        }
+}
+
+/// Makes packets at random, and says what is in them.
+Bytes RandomPackets(std::mt19937& random, std::size_t width, Bytes& values)
+{
+    Bytes packets;
+    while (values.size() < width) {
+        std::size_t most = random() % 4 ? 127 : 9;
+        std::size_t count =
+            std::min(random() % most + 1, width - values.size());
+        auto value = [&] { return static_cast<unsigned char>(random()); };
+        if (random() % 2) {
+            packets.push_back(static_cast<unsigned char>(count));
+            packets.push_back(value());
+            values.insert(values.end(), count, packets.back());
+        } else {
+            packets.push_back(static_cast<unsigned char>(0x80 | count));
+            for (; count; --count) {
+                packets.push_back(value());
+                values.push_back(packets.back());
+            }
+        }
+    }
+    return packets;
+}
+
+TEST_P(PixelLanesTest, FourRowsAreUnpackedWhileFourOthersAreJoined)
+{
+    for (int i = 0; i < 1000; ++i) {
+        std::vector<Packed> packed;
+        Bytes expected[4];
+        PackedRow rows[4];
+        for (Bytes& values : expected) {
+            std::size_t width = Word() % 3 ? 1500 : Word() % 300;
+            Bytes packets = RandomPackets(random, width, values);
+            packed.emplace_back(packets, width);
+        }
+        for (std::size_t row = 0; row < 4; ++row)
+            rows[row] = packed[row].Row();
+        std::size_t count = Word() % 3 ? 1500 : Word() % 300;
+        Bytes bytes[4];
+        for (Bytes& row : bytes)
+            row = RandomBytes(count);
+        Words words(count + 1, 0x01234567);
+        Joining joining = {{bytes[0].data(), bytes[1].data(), bytes[2].data(),
+                            bytes[3].data()},
+                           words.data(),
+                           count};
+
+        bool exact = lanes.unpack(rows, guesses[i % 2], joining);
+
+        ASSERT_TRUE(exact);
+        for (std::size_t row = 0; row < 4; ++row)
+            ASSERT_EQ(packed[row].Values(), expected[row]) << i;
+        Words joined(count + 1, 0x01234567);
+        PixelLanes::plain().join(joining.bytes, joined.data(), count);
+        ASSERT_EQ(words, joined) << i;
     }
 }
 
@@ -209,11 +395,9 @@ TEST(PixelLanes, TheFastestAreInUseUnlessOthersAreInstalled)
     EXPECT_EQ(&PixelLanes::current(), &PixelLanes::fastest());
 }
 
-TEST(PixelLanes, TheyAreToldApartByTheirNames)
+TEST(PixelLanes, TheWidestAreTheFastest)
 {
-    EXPECT_STREQ(PixelLanes::plain().name(), "plain");
-    bool same = &PixelLanes::plain() == &PixelLanes::fastest();
-    EXPECT_STREQ(PixelLanes::fastest().name(), same ? "plain" : "avx2");
+    EXPECT_EQ(&PixelLanes::fastest(), AllLanes().back());
 }
 
 } // namespace

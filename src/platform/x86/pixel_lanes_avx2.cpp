@@ -2,11 +2,14 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
+#include "platform/unpack_rows.h"
+
 #include <bit>
 #include <immintrin.h>
 
 // Every operation does whole blocks and leaves the rest of the row to the
-// plain one. Loads and stores touch nothing outside the rows.
+// plain one. Loads and stores touch nothing outside the rows, but for the slack
+// of those that are unpacked.
 
 namespace zt_platform {
 
@@ -210,110 +213,148 @@ struct Values
     store_pixels(scaled(sum, lines.scale), averages + at);
 }
 
-class Avx2PixelLanes final : public PixelLanes
+/// Registers of 32 bytes.
+struct Avx2Wide
 {
-public:
-    const char* name() const override { return "avx2"; }
+    static constexpr std::size_t block = zt_platform::block;
 
-    [[gnu::target("avx2")]] void join(const unsigned char* const (&bytes)[4],
-                                      std::uint32_t* words,
-                                      std::size_t count) const override
+    [[gnu::target("avx2")]] static void
+    copy(unsigned char* to, const unsigned char* from, std::size_t)
     {
-        std::size_t at = 0;
-        for (; at + block <= count; at += block)
-            join_block(bytes, at, words + at);
-        PixelLanes::join(
-            {bytes[0] + at, bytes[1] + at, bytes[2] + at, bytes[3] + at},
-            words + at, count - at);
+        for (std::size_t at = 0; at < PixelLanes::packet_slack; at += block)
+            store(to + at, load(from + at));
     }
 
-    [[gnu::target("avx2")]] void split(const std::uint32_t* words,
-                                       unsigned char* const (&bytes)[4],
-                                       std::size_t count) const override
+    [[gnu::target("avx2")]] static void
+    fill(unsigned char* to, unsigned char value, std::size_t count)
     {
-        std::size_t at = 0;
-        for (; at + block <= count; at += block)
-            split_block(words + at, bytes, at);
-        PixelLanes::split(
-            words + at,
-            {bytes[0] + at, bytes[1] + at, bytes[2] + at, bytes[3] + at},
-            count - at);
+        const __m256i values = _mm256_set1_epi8(static_cast<char>(value));
+        store(to, values);
+        if (count > block)
+            for (std::size_t at = block; at < PixelLanes::packet_slack;
+                 at += block)
+                store(to + at, values);
     }
 
-    [[gnu::target("avx2")]] std::size_t
-    find_three_equal(const unsigned char* bytes,
-                     std::size_t count) const override
+    [[gnu::target("avx2")]] static void
+    join(const unsigned char* const (&rows)[4], std::size_t at,
+         std::uint32_t* words)
     {
-        std::size_t at = 0;
-        for (; at + block + 2 <= count; at += block) {
-            __m256i middle = load(bytes + at + 1);
-            __m256i equal = _mm256_and_si256(
-                _mm256_cmpeq_epi8(load(bytes + at), middle),
-                _mm256_cmpeq_epi8(middle, load(bytes + at + 2)));
-            unsigned found = static_cast<unsigned>(_mm256_movemask_epi8(equal));
-            if (found)
-                return at + static_cast<unsigned>(std::countr_zero(found));
-        }
-        return at + PixelLanes::find_three_equal(bytes + at, count - at);
-    }
-
-    [[gnu::target("avx2")]] std::size_t
-    count_equal(const unsigned char* bytes, std::size_t count) const override
-    {
-        const __m256i first = _mm256_set1_epi8(static_cast<char>(bytes[0]));
-        for (std::size_t at = 0; at + block <= count; at += block) {
-            unsigned equal = static_cast<unsigned>(_mm256_movemask_epi8(
-                _mm256_cmpeq_epi8(load(bytes + at), first)));
-            if (equal != 0xFFFFFFFF)
-                return at + static_cast<unsigned>(std::countr_one(equal));
-        }
-        std::size_t at = count - count % block;
-        while (at < count && bytes[at] == bytes[0])
-            ++at;
-        return at;
-    }
-
-    [[gnu::target("avx2")]] void turn(const std::uint32_t* words,
-                                      std::size_t stride,
-                                      std::uint32_t* columns,
-                                      std::size_t columns_stride) const override
-    {
-        Columns upper = turn_half(words, stride);
-        Columns lower = turn_half(words + 4 * stride, stride);
-        for (std::size_t i = 0; i < 4; ++i) {
-            store(
-                columns + i * columns_stride,
-                _mm256_permute2x128_si256(upper.both[i], lower.both[i], 0x20));
-            store(
-                columns + (i + 4) * columns_stride,
-                _mm256_permute2x128_si256(upper.both[i], lower.both[i], 0x31));
-        }
-    }
-
-    [[gnu::target("avx2")]] void pick(const std::uint32_t* words,
-                                      const int* places, std::uint32_t* picked,
-                                      std::size_t count) const override
-    {
-        std::size_t at = 0;
-        for (; at + picked_words <= count; at += picked_words)
-            store(picked + at, pick_block(words, load(places + at)));
-        PixelLanes::pick(words, places + at, picked + at, count - at);
-    }
-
-    [[gnu::target("avx2")]] void average(const Average& lines,
-                                         std::uint32_t* averages,
-                                         std::size_t count) const override
-    {
-        std::size_t at = 0;
-        for (; at + averaged_pixels <= count; at += averaged_pixels)
-            average_block(lines, at, averages);
-        average_from(lines, averages, at, count);
+        join_block(rows, at, words);
     }
 };
 
-constinit const Avx2PixelLanes avx2_lanes;
+struct InstalledLanes final : Avx2PixelLanes
+{};
+
+constinit const InstalledLanes avx2_lanes;
 
 } // namespace
+
+const char* Avx2PixelLanes::name() const
+{
+    return "avx2";
+}
+
+[[gnu::target("avx2")]] void
+Avx2PixelLanes::join(const unsigned char* const (&bytes)[4],
+                     std::uint32_t* words, std::size_t count) const
+{
+    std::size_t at = 0;
+    for (; at + block <= count; at += block)
+        join_block(bytes, at, words + at);
+    PixelLanes::join(
+        {bytes[0] + at, bytes[1] + at, bytes[2] + at, bytes[3] + at},
+        words + at, count - at);
+}
+
+[[gnu::target("avx2")]] void
+Avx2PixelLanes::split(const std::uint32_t* words,
+                      unsigned char* const (&bytes)[4], std::size_t count) const
+{
+    std::size_t at = 0;
+    for (; at + block <= count; at += block)
+        split_block(words + at, bytes, at);
+    PixelLanes::split(
+        words + at,
+        {bytes[0] + at, bytes[1] + at, bytes[2] + at, bytes[3] + at},
+        count - at);
+}
+
+[[gnu::target("avx2")]] std::size_t
+Avx2PixelLanes::find_three_equal(const unsigned char* bytes,
+                                 std::size_t count) const
+{
+    std::size_t at = 0;
+    for (; at + block + 2 <= count; at += block) {
+        __m256i middle = load(bytes + at + 1);
+        __m256i equal =
+            _mm256_and_si256(_mm256_cmpeq_epi8(load(bytes + at), middle),
+                             _mm256_cmpeq_epi8(middle, load(bytes + at + 2)));
+        unsigned found = static_cast<unsigned>(_mm256_movemask_epi8(equal));
+        if (found)
+            return at + static_cast<unsigned>(std::countr_zero(found));
+    }
+    return at + PixelLanes::find_three_equal(bytes + at, count - at);
+}
+
+[[gnu::target("avx2")]] std::size_t
+Avx2PixelLanes::count_equal(const unsigned char* bytes, std::size_t count) const
+{
+    const __m256i first = _mm256_set1_epi8(static_cast<char>(bytes[0]));
+    for (std::size_t at = 0; at + block <= count; at += block) {
+        unsigned equal = static_cast<unsigned>(
+            _mm256_movemask_epi8(_mm256_cmpeq_epi8(load(bytes + at), first)));
+        if (equal != 0xFFFFFFFF)
+            return at + static_cast<unsigned>(std::countr_one(equal));
+    }
+    std::size_t at = count - count % block;
+    while (at < count && bytes[at] == bytes[0])
+        ++at;
+    return at;
+}
+
+[[gnu::target("avx2")]] void
+Avx2PixelLanes::turn(const std::uint32_t* words, std::size_t stride,
+                     std::uint32_t* columns, std::size_t columns_stride) const
+{
+    Columns upper = turn_half(words, stride);
+    Columns lower = turn_half(words + 4 * stride, stride);
+    for (std::size_t i = 0; i < 4; ++i) {
+        store(columns + i * columns_stride,
+              _mm256_permute2x128_si256(upper.both[i], lower.both[i], 0x20));
+        store(columns + (i + 4) * columns_stride,
+              _mm256_permute2x128_si256(upper.both[i], lower.both[i], 0x31));
+    }
+}
+
+[[gnu::target("avx2")]] void Avx2PixelLanes::pick(const std::uint32_t* words,
+                                                  const int* places,
+                                                  std::uint32_t* picked,
+                                                  std::size_t count) const
+{
+    std::size_t at = 0;
+    for (; at + picked_words <= count; at += picked_words)
+        store(picked + at, pick_block(words, load(places + at)));
+    PixelLanes::pick(words, places + at, picked + at, count - at);
+}
+
+[[gnu::target("avx2")]] void Avx2PixelLanes::average(const Average& lines,
+                                                     std::uint32_t* averages,
+                                                     std::size_t count) const
+{
+    std::size_t at = 0;
+    for (; at + averaged_pixels <= count; at += averaged_pixels)
+        average_block(lines, at, averages);
+    average_from(lines, averages, at, count);
+}
+
+[[gnu::target("avx2")]] bool Avx2PixelLanes::unpack(const PackedRow (&rows)[4],
+                                                    Packets packets,
+                                                    const Joining& beside) const
+{
+    return unpack_rows<Avx2Wide>(*this, rows, packets, beside);
+}
 
 const PixelLanes* avx2_pixel_lanes()
 {
