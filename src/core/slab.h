@@ -5,10 +5,11 @@
 /// The store from which the containers take their links and nodes.
 ///
 /// Pieces are carved from large slabs, one behind the other, and are never
-/// given back: a container keeps what it frees in a chain of its own and takes
+/// given back: a list keeps the links it frees in a chain of its own and takes
 /// from there first. That makes a piece cheap, keeps neighbours close together
-/// and lets a whole chain of links be freed by one splice. The slabs grow with
-/// what is asked for, up to 32 MiB, so that many links lie on large pages.
+/// and lets a whole chain of links be freed by one splice. Nodes, of which none
+/// is like the next, lie in blocks instead (`node_store.h`). The slabs grow
+/// with what is asked for, up to 32 MiB, so that many links lie on large pages.
 ///
 /// Everything is constant-initialised and never destroyed, so containers may
 /// live before `main` and after it.
