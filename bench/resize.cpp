@@ -74,28 +74,46 @@ Picture Noise(std::size_t count)
 
 enum class Filter { Nearest, Area };
 
+literal::Pixels ScaledLiterally(const literal::Pixels& source, Filter filter,
+                                const Sizes& sizes)
+{
+    const auto scale =
+        filter == Filter::Nearest ? &literal::Zoom : &literal::Fant;
+    return scale(source, sizes.width, sizes.height, sizes.new_width,
+                 sizes.new_height);
+}
+
+using Scale = void (ZtImageSGI::*)(int, int);
+
+/// Makes sure that ours and the literal form give the same picture.
+void RequireSamePicture(const ZtImageSGI& source, Scale scale, Filter filter,
+                        const Sizes& sizes)
+{
+    const literal::Pixels expected = ScaledLiterally(
+        {source.pixels, source.pixels + sizes.Pixels()}, filter, sizes);
+    ZtImageSGI image(source);
+    (image.*scale)(sizes.new_width, sizes.new_height);
+    Require(image.width == sizes.new_width &&
+                image.height == sizes.new_height &&
+                expected.size() == sizes.NewPixels() &&
+                std::memcmp(image.pixels, expected.data(),
+                            expected.size() * sizeof(ZtPixel)) == 0,
+            filter == Filter::Nearest ? "Resize" : "ResizeBest");
+}
+
 void ScaleOurs(benchmark::State& state, Filter filter, Sizes sizes)
 {
-    const auto scale = filter == Filter::Nearest ? &ZtImageSGI::Resize
-                                                 : &ZtImageSGI::ResizeBest;
+    const Scale scale = filter == Filter::Nearest ? &ZtImageSGI::Resize
+                                                  : &ZtImageSGI::ResizeBest;
     const ZtImageSGI source(sizes.width, sizes.height,
                             Noise(sizes.Pixels()).release());
-    literal::Pixels plain(source.pixels, source.pixels + sizes.Pixels());
-    plain = filter == Filter::Nearest
-                ? literal::Zoom(plain, sizes.width, sizes.height,
-                                sizes.new_width, sizes.new_height)
-                : literal::Fant(plain, sizes.width, sizes.height,
-                                sizes.new_width, sizes.new_height);
+    RequireSamePicture(source, scale, filter, sizes);
     for (auto _ : state) {
         state.PauseTiming();
         ZtImageSGI image(source);
         state.ResumeTiming();
         (image.*scale)(sizes.new_width, sizes.new_height);
         state.PauseTiming();
-        if (filter == Filter::Nearest)
-            Require(std::memcmp(image.pixels, plain.data(),
-                                plain.size() * sizeof(ZtPixel)) == 0,
-                    "Resize");
         image = ZtImageSGI(1, 1, NewPicture(1).release());
         state.ResumeTiming();
     }
@@ -106,16 +124,11 @@ void ScaleLiterally(benchmark::State& state, Filter filter, Sizes sizes)
     const Picture noise = Noise(sizes.Pixels());
     const literal::Pixels source(noise.get(), noise.get() + sizes.Pixels());
     for (auto _ : state)
-        benchmark::DoNotOptimize(
-            filter == Filter::Nearest
-                ? literal::Zoom(source, sizes.width, sizes.height,
-                                sizes.new_width, sizes.new_height)
-                : literal::Fant(source, sizes.width, sizes.height,
-                                sizes.new_width, sizes.new_height));
+        benchmark::DoNotOptimize(ScaledLiterally(source, filter, sizes));
 }
 
-template <typename Scale>
-void ScalePeer(benchmark::State& state, Sizes sizes, Scale scale)
+template <typename ScaleByPeer>
+void ScalePeer(benchmark::State& state, Sizes sizes, ScaleByPeer scale)
 {
     const Picture original = Noise(sizes.Pixels());
     for (auto _ : state) {

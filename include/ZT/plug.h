@@ -139,8 +139,8 @@ public:
     /// Null and the empty text are the current directory.
     ///
     /// A file stays loaded if its id matches and its entry has registered at
-    /// least one plug; otherwise it is closed without a word. Files that are
-    /// no regular ones, and a plug-in whose entry is running, are passed over.
+    /// least one plug; otherwise it is closed without a word. FIFOs, devices
+    /// and sockets, and a plug-in whose entry is running, are passed over.
     ///
     /// Reports:   what the loader cannot load, straight to standard error, in
     ///            the loader's words; a warning if an entry throws, after

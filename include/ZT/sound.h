@@ -118,7 +118,8 @@ public:
     ///
     /// At a speed other than 1 it lasts `play_speed` times as long; with a
     /// sample that is too short to make another of, it ends. A device that
-    /// goes away takes the rest at once.
+    /// goes away takes the rest at once. A sound whose rate is not above 0 is
+    /// not played.
     ///
     /// Requires: a sound.
     /// Reports:  an error "Failed to open an audio port for writing.\n"; then

@@ -77,8 +77,9 @@ public:
     /// Returns: never null.
     virtual const char* error_text() = 0;
 
-    /// Tells whether there is something other than a regular file at `path`,
-    /// links followed. What cannot be examined is not.
+    /// Tells whether there is something at `path`, links followed, that must
+    /// not be opened to find out that it is no shared object: a FIFO, a device
+    /// or a socket. What cannot be examined is not.
     virtual bool is_special_file(const char* path) = 0;
 
     /// Lists the names of the directory at `path` that `wanted` accepts, in

@@ -2,7 +2,6 @@
 
 #include "platform/unpack_rows.h"
 #include "platform/x86/pixel_lanes_avx2.h"
-#include "platform/x86/pixel_lanes_avx512.h"
 
 #include <cstring>
 
@@ -150,8 +149,6 @@ const PixelLanes& PixelLanes::plain()
 
 const PixelLanes& PixelLanes::fastest()
 {
-    if (const PixelLanes* widest = avx512_pixel_lanes())
-        return *widest;
     const PixelLanes* wide = avx2_pixel_lanes();
     return wide ? *wide : plain_lanes;
 }

@@ -86,7 +86,7 @@ public:
 
     /// Picks the words at these places.
     ///
-    /// Requires: places of at least 0, in `words`.
+    /// Requires: places of at least 0, in `words`, none below the one before.
     virtual void pick(const std::uint32_t* words, const int* places,
                       std::uint32_t* picked, std::size_t count) const;
 

@@ -286,7 +286,7 @@ void KvoSound::Stereo(const KvoSound* other)
     if (!zt_sound::is_ready(*this) || channels == 2)
         return;
     short* both = zt_sound::new_samples(frames, 2);
-    if (!both)
+    if (!both && frames > 0)
         return;
     const std::size_t count = zt_sound::frames_of(*this);
     const short* right = samples;

@@ -196,7 +196,9 @@ void ZtSoundControl::Play(KvoSound* sound)
         return;
     }
     OutputRate(sound->rate);
-    play_through(*port, *sound);
+    // At no rate nothing would ever leave the queue.
+    if (sound->rate > 0)
+        play_through(*port, *sound);
     port->release();
     AudioDevice::current().settle();
 }

@@ -297,6 +297,9 @@ TEST(KvoPrefs, TheQueryCommandIsFixedAtLoad)
     EXPECT_EQ(installation.Ask({"setenv", "QUARN_LOCATION", "/elsewhere",
                                 "variable", "LIGHT", "", "help"}),
               (Lines{"set", "dim", installation.location + "/Help"}));
+    EXPECT_EQ(installation.Ask({"overwrite", "QUARN_LOCATION", "variable",
+                                "LIGHT", "", "help"}),
+              (Lines{"overwritten", "dim", installation.location + "/Help"}));
 }
 
 TEST(KvoPrefs, TheSettingsAreReadAtLoadByOneShellLine)

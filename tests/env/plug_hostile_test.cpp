@@ -164,10 +164,21 @@ TEST(HostilePlugIns, ALinkToNothingIsToldInTheLoadersWords)
               0U);
 }
 
-TEST(HostilePlugIns, WhatIsNoRegularFileIsPassedOverSilently)
+TEST(HostilePlugIns, ADirectoryIsToldInTheLoadersWords)
 {
     PluginDir dir("good");
     std::filesystem::create_directory(dir.Path("directory.t.so"));
+    TestCatalog catalog;
+
+    EXPECT_EQ(ErrorsOfScanning(catalog, dir.Dir()),
+              dir.Path("directory.t.so") +
+                  ": cannot read file data: Is a directory\n");
+    EXPECT_EQ(catalog.Names(), (Names{"good"}));
+}
+
+TEST(HostilePlugIns, PipesAndDevicesArePassedOverSilently)
+{
+    PluginDir dir("good");
     ASSERT_EQ(mkfifo(dir.Path("fifo.t.so").c_str(), 0600), 0);
     std::filesystem::create_symlink("/dev/zero", dir.Path("zeros.t.so"));
     std::filesystem::create_symlink("fifo.t.so", dir.Path("link.t.so"));

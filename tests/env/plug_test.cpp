@@ -114,6 +114,8 @@ TEST(ZtPlugCatalog, IdsMatchWhenNameAndBothNumbersAreEqual)
     EXPECT_FALSE(Matches("Recognizer:2.1", "Recognize:2.1"));
     EXPECT_FALSE(Matches("Recognizer:2.1", ""));
     EXPECT_FALSE(Matches("Recognizer:2.1", nullptr));
+    EXPECT_TRUE(Matches("", ""));
+    EXPECT_FALSE(Matches("", nullptr));
 }
 
 TEST(ZtPlugCatalog, WithoutTheExactVersionAnOlderFirstNumberMatchesToo)

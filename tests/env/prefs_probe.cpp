@@ -160,6 +160,11 @@ std::map<std::string, Answer> questions()
         const KvoPrefs another;
         return std::string("made");
     };
+    all["overwrite"] = [](Words& words) {
+        char* text = std::getenv(words.Take());
+        std::memset(text, 'x', std::strlen(text));
+        return std::string("overwritten");
+    };
     all["setenv"] = [](Words& words) {
         const char* name = words.Take();
         setenv(name, words.Take(), 1);

@@ -8,7 +8,6 @@
 #include "image/pictures.h"
 #include "image/sgi_bytes.h"
 #include "platform/x86/pixel_lanes_avx2.h"
-#include "platform/x86/pixel_lanes_avx512.h"
 #include "support/FaultyFiles.h"
 #include "support/TempDir.h"
 
@@ -313,8 +312,7 @@ TEST(sgi_reader, WideRowsAgreeWithAPlainReaderOnAllLanes)
         PixelList expected = literal::ReadSgi(file).pixels;
 
         for (const PixelLanes* lanes :
-             {&PixelLanes::plain(), zt_platform::avx2_pixel_lanes(),
-              zt_platform::avx512_pixel_lanes()}) {
+             {&PixelLanes::plain(), zt_platform::avx2_pixel_lanes()}) {
             PixelLanes::install(lanes);
             ASSERT_EQ(Read(file), expected) << i;
         }

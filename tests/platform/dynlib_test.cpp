@@ -4,6 +4,7 @@
 #include <cstdint>
 #include <cstring>
 #include <string>
+#include <sys/stat.h>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -282,12 +283,14 @@ TEST(Dynlib, ListsNoDirectoryThatIsNone)
     EXPECT_EQ(names.first(), nullptr);
 }
 
-TEST(Dynlib, KnowsWhatIsNoRegularFile)
+TEST(Dynlib, KnowsWhatMustNotBeOpened)
 {
     TempDir dir;
+    ASSERT_EQ(mkfifo(dir.Path("fifo").c_str(), 0600), 0);
 
-    EXPECT_TRUE(Dynlib::current().is_special_file(dir.Path("").c_str()));
+    EXPECT_TRUE(Dynlib::current().is_special_file(dir.Path("fifo").c_str()));
     EXPECT_TRUE(Dynlib::current().is_special_file("/dev/null"));
+    EXPECT_FALSE(Dynlib::current().is_special_file(dir.Path("").c_str()));
     EXPECT_FALSE(
         Dynlib::current().is_special_file(dir.Write("file", "").c_str()));
     EXPECT_FALSE(Dynlib::current().is_special_file("/nowhere"));

@@ -226,12 +226,18 @@ TEST(KvoSound, ALeaderIsTruncatedAsAWhole)
 TEST(KvoSound, OddLeadersStayInTheirBuffer)
 {
     const KvoSound overlapping(Seconds(-0.5), Seconds(0.5));
+    const KvoSound begins_outside(Seconds(-0.9), Seconds(0.5));
     const KvoSound negative_pad(Seconds(1), Seconds(-0.25));
     const KvoSound nothing(Seconds(-1), Seconds(0.5));
     const KvoSound endless(KvoTime::FOREVER, KvoTime::FOREVER);
 
     EXPECT_EQ(overlapping.frames, 4000);
     EXPECT_EQ(overlapping.samples[0], 16000);
+    // Its last pad would begin 3200 frames before the sound.
+    Samples clicks(800, 0);
+    for (std::size_t i = 0; i < clicks.size(); i += 10)
+        clicks[i] = 16000;
+    EXPECT_EQ(SamplesOf(begins_outside), clicks);
     EXPECT_EQ(SamplesOf(negative_pad), Samples(4000, 0));
     EXPECT_EQ(nothing.frames, 0);
     EXPECT_EQ(nothing.samples, nullptr);
@@ -786,6 +792,20 @@ TEST(KvoSound, WithoutABufferNothingHappensAndNothingIsSaid)
         EXPECT_EQ(SamplesOf(other), (Samples{1, 2}));
         EXPECT_EQ(reports.Text(), "");
     }
+}
+
+TEST(KvoSound, ABufferOfNoFramesChangesItsChannelsLikeOthers)
+{
+    KvoSound widened(8000, 1, 0, new short[2]);
+    KvoSound mixed(8000, 2, 0, new short[2]);
+
+    widened.Stereo(nullptr);
+    mixed.Mono(0);
+
+    EXPECT_EQ(widened.channels, 2);
+    EXPECT_EQ(widened.frames, 0);
+    EXPECT_EQ(mixed.channels, 1);
+    EXPECT_EQ(mixed.frames, 0);
 }
 
 TEST(KvoSound, ABufferOfNoFramesSurvivesEverything)

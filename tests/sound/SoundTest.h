@@ -38,6 +38,17 @@ protected:
         Beats(1);
     }
 
+    /// Starts a timer so that what is posted for its start begins a whole
+    /// number of 100 ms after the beat did: repeats of 100 ms then come a whole
+    /// number of 100 ms later.
+    void StartInStep(ZtTimer& timer)
+    {
+        while ((Milliseconds() + 8) % 100 != 0)
+            Beats(1);
+        Start(timer);
+        Beats(1);
+    }
+
     FakeAudioDevice device;
     BeatErrorTrap reports;
 };

@@ -185,6 +185,23 @@ TEST(aifc_writer, WhatIsSavedLoadsAsTheSameSound)
         }
 }
 
+TEST(aifc_writer, MoreThanAFileCanHoldIsReportedBeforeAnythingIsWritten)
+{
+    const TempDir directory;
+    const std::string path = directory.Write("a", "old");
+    // Twelve gigabytes in the file, which are not there in memory.
+    KvoSound sound(8000, 2, 2147483647, new short[2]);
+    sound.width = 4;
+    const ErrorTrap reports;
+
+    RunInAChild([&] { sound.Save(path.c_str()); });
+    sound.Save(path.c_str());
+
+    EXPECT_EQ(reports.Text(),
+              "Error: Failed to write audio file [" + path + "].\n");
+    EXPECT_EQ(directory.Read("a"), "old");
+}
+
 // --- reports and faults
 // ------------------------------------------------------------
 

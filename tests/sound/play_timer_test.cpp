@@ -10,6 +10,33 @@ using Control = ZtSoundControl;
 const KvoTime one_second(0, 0, 1, 0);
 const KvoTime ten_seconds(0, 0, 10, 0);
 
+/// The system's pages, with a limit and a count of what is large and in use.
+class WatchedPages : public zt_platform::Pages
+{
+public:
+    WatchedPages() : real(current()), before(install(this)) {}
+    ~WatchedPages() { install(before); }
+    void* map(std::size_t bytes) override
+    {
+        void* const memory = bytes > most_bytes ? nullptr : real.map(bytes);
+        large += memory && bytes >= large_bytes;
+        return memory;
+    }
+    void unmap(void* memory, std::size_t bytes) override
+    {
+        large -= memory && bytes >= large_bytes;
+        real.unmap(memory, bytes);
+    }
+
+    std::size_t most_bytes = std::numeric_limits<std::size_t>::max();
+    int large = 0;
+
+private:
+    static constexpr std::size_t large_bytes = 1000000;
+    zt_platform::Pages& real;
+    zt_platform::Pages* before;
+};
+
 class PlayTimer : public SoundTest
 {
 protected:
@@ -83,6 +110,34 @@ TEST_F(PlayTimer, ALongSoundIsFedInBlocksOf50000)
     EXPECT_EQ(device.blocks,
               (std::vector<long>{100000, 50000, 50000, 50000, 20000}));
     EXPECT_EQ(device.played, Ramp(270000));
+}
+
+TEST_F(PlayTimer, TheRestIsQueuedAsSoonAsAllOfItFits)
+{
+    ZtTimer timer(KvoTime(), KvoTime(0, 1, 0, 0));
+    KvoSound sound = MonoSound(Ramp(150000), 10000);
+    Control::Play(&sound, &timer, KvoTime());
+    StartInStep(timer);
+
+    RunFor(4.9);
+    EXPECT_EQ(device.blocks, std::vector<long>{100000});
+    RunFor(0.1); // now exactly 50000 are free
+
+    EXPECT_EQ(device.blocks, (std::vector<long>{100000, 50000}));
+}
+
+TEST_F(PlayTimer, ABlockIsQueuedWhenMoreThanHalfOfTheQueueIsFree)
+{
+    ZtTimer timer(KvoTime(), KvoTime(0, 1, 0, 0));
+    KvoSound sound = MonoSound(Ramp(250000), 10000);
+    Control::Play(&sound, &timer, KvoTime());
+    StartInStep(timer);
+
+    RunFor(5); // exactly 50000 are free
+    EXPECT_EQ(device.blocks, std::vector<long>{100000});
+    RunFor(0.1);
+
+    EXPECT_EQ(device.blocks, (std::vector<long>{100000, 50000}));
 }
 
 TEST_F(PlayTimer, TheSoundIsFedEveryHundredMilliseconds)
@@ -240,6 +295,23 @@ TEST_F(PlayTimer, ABackwardTimerDoesNotPlayWhatLiesBehindItsEnd)
     EXPECT_EQ(device.ready_ports, 0);
 }
 
+TEST_F(PlayTimer, TheReversedCopyGoesWhenTheQueueHasDrained)
+{
+    ZtTimer timer(KvoTime(0, 1, 40, 0), KvoTime());
+    KvoSound sound = MonoSound(Ramp(500000), 50000);
+    WatchedPages pages;
+    Control::Play(&sound, &timer, KvoTime(0, 1, 30, 0)); // the whole of it
+    const int with_copy = pages.large;
+    Start(timer);
+
+    RunFor(9.9);
+    EXPECT_EQ(pages.large, with_copy);
+    RunFor(0.3);
+
+    EXPECT_EQ(pages.large, with_copy - 1);
+    EXPECT_EQ(timer.state, ZtTimer::Running);
+}
+
 TEST_F(PlayTimer, AStereoSoundPlayedBackwardExchangesItsChannels)
 {
     ZtTimer timer(ten_seconds, KvoTime());
@@ -267,31 +339,8 @@ TEST_F(PlayTimer, ATimerThatIsTurnedRoundLaterPlaysTheOtherWay)
 
 TEST_F(PlayTimer, WithoutMemoryForTheReversedCopyNothingIsPlayed)
 {
-    class NoLargePages : public zt_platform::Pages
-    {
-    public:
-        NoLargePages() : before(install(this)), real(current_before()) {}
-        ~NoLargePages() { install(before); }
-        void* map(std::size_t bytes) override
-        {
-            return bytes > 4000000 ? nullptr : real.map(bytes);
-        }
-        void unmap(void* memory, std::size_t bytes) override
-        {
-            real.unmap(memory, bytes);
-        }
-
-    private:
-        zt_platform::Pages& current_before()
-        {
-            install(before);
-            zt_platform::Pages& pages = current();
-            install(this);
-            return pages;
-        }
-        zt_platform::Pages* before;
-        zt_platform::Pages& real;
-    } no_large_pages;
+    WatchedPages pages;
+    pages.most_bytes = 4000000;
     ZtTimer timer(ten_seconds, KvoTime());
     KvoSound sound = MonoSound(Ramp(2500000), 8000);
 
@@ -449,6 +498,22 @@ TEST_F(PlayTimer, ATimerStoppedBeforeTheSoundBeganPlaysItLater)
     RunFor(2);
 
     EXPECT_EQ(device.played, Ramp(800));
+}
+
+TEST_F(PlayTimer, ReArmedTriggersLeaveASoundThatPlaysAlone)
+{
+    ZtTimer timer(KvoTime(), ten_seconds);
+    KvoSound sound = MonoSound(Ramp(16000), 8000);
+    Control::Play(&sound, &timer, KvoTime());
+    Start(timer);
+    RunFor(1);
+
+    timer.reset_callbacks();
+    RunFor(2);
+
+    EXPECT_EQ(device.played, Ramp(16000));
+    EXPECT_EQ(device.opens.size(), 1U);
+    EXPECT_EQ(reports.Text(), "");
 }
 
 TEST_F(PlayTimer, ReArmedTriggersPlayADrainedSoundOnceMore)

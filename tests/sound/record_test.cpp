@@ -182,6 +182,31 @@ TEST_F(RecordTest, OneChunkAtMostIsTakenAtATime)
               Ramp(static_cast<std::size_t>(Result()->frames)));
 }
 
+TEST_F(RecordTest, AChunkIsTakenAsSoonAsItIsWhole)
+{
+    Control::RecordSetFrequency(25000);
+    ZtTimer timer;
+    Control::Record(&timer, KvoTime());
+    StartInStep(timer);
+
+    RunFor(0.9);
+    EXPECT_EQ(Control::sound_record.chunk_count, 0);
+    RunFor(0.1); // now exactly a chunk waits
+
+    EXPECT_EQ(Control::sound_record.chunk_count, 1);
+    timer.stop();
+    Beats(1);
+}
+
+TEST_F(RecordTest, AWholeChunkThatWaitsAtTheEndIsTheLastOne)
+{
+    RecordSamples(25000, 312500); // before the first look at the queue
+
+    EXPECT_EQ(Control::sound_record.chunk_count, 0);
+    EXPECT_EQ(Control::sound_record.last_count, 25000);
+    EXPECT_EQ(SamplesOf(*Result()), Ramp(25000));
+}
+
 TEST_F(RecordTest, TheNaturalEndOfTheTimerEndsTheRecording)
 {
     ZtTimer timer(KvoTime(), KvoTime(0, 0, 2, 0));

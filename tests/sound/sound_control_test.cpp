@@ -195,12 +195,27 @@ TEST_F(SoundControl, PlaySleepsTenClockTicksAtATime)
 
 TEST_F(SoundControl, PlayWaitsUntilHalfOfTheQueueIsFree)
 {
+    struct CountingClock : FakeClock
+    {
+        explicit CountingClock(FakeAudioDevice& its_device) : audio(its_device)
+        {}
+        void sleep_nanoseconds(std::uint64_t nanoseconds) override
+        {
+            FakeClock::sleep_nanoseconds(nanoseconds);
+            ++sleeps_after[audio.blocks.size()];
+        }
+        FakeAudioDevice& audio;
+        int sleeps_after[8] = {};
+    } counting(device);
     KvoSound sound = MonoSound(Ramp(70000), 1000);
 
     Control::Play(&sound);
 
-    // Six blocks fit before the seventh has to wait for 10000 samples.
+    // Six blocks fit before the seventh has to wait for 10000 samples, which
+    // take ten seconds.
     EXPECT_EQ(device.blocks, std::vector<long>(7, 10000));
+    EXPECT_EQ(counting.sleeps_after[5], 0);
+    EXPECT_EQ(counting.sleeps_after[6], 100);
     EXPECT_EQ(device.played, Ramp(70000));
 }
 
@@ -272,6 +287,47 @@ TEST_F(SoundControl, ASoundWithoutABufferIsPlayedAsNothing)
     Control::Play(nullptr);
     EXPECT_EQ(device.opens.size(), 1U);
     EXPECT_EQ(reports.Text(), "");
+}
+
+TEST_F(SoundControl, ASoundOfNoRateIsNotWaitedFor)
+{
+    for (const long rate : {0L, -8000L, -9223372036854775807L - 1}) {
+        KvoSound sound = MonoSound(Ramp(10), rate);
+
+        Control::Play(&sound);
+
+        EXPECT_TRUE(device.blocks.empty()) << rate;
+        EXPECT_EQ(device.open_ports, 0);
+    }
+    EXPECT_EQ(device.opens.size(), 3U);
+    EXPECT_EQ(reports.Text(), "");
+}
+
+TEST_F(SoundControl, PlaybackRequestedInsideTheBeatFindsNoPort)
+{
+    static KvoSound sound = MonoSound(Ramp(10));
+    static float position = 0;
+    ZtTimer timer;
+    // Errors are made ready by a request from outside.
+    ZtTimer later;
+    for (int request = 0; request < 3; ++request)
+        Control::Play(&sound, &later, KvoTime());
+
+    timer.post_trigger(
+        [](ZtTimer* its_timer, void*) {
+            Control::Play(&sound);
+            Control::Play(&sound, its_timer, KvoTime());
+            Control::PlayDrag(&sound, its_timer, 100, &position);
+        },
+        nullptr, KvoTime());
+    Start(timer);
+    Beats(3);
+
+    const std::string one =
+        "Error: Failed to open an audio port for writing.\n";
+    EXPECT_EQ(reports.Text(), one + one + one);
+    EXPECT_TRUE(device.opens.empty());
+    EXPECT_EQ(timer.stop_callbacks, nullptr);
 }
 
 TEST_F(SoundControl, WithoutADevicePlayReportsAndPlaysNothing)

@@ -1,6 +1,8 @@
 #include <KVO/KvoSound.h>
 
+#include <algorithm>
 #include <memory>
+#include <random>
 
 #include <gtest/gtest.h>
 
@@ -240,6 +242,24 @@ TEST(sound_edit, AnEndlessSpanChangesNothing)
     EXPECT_EQ(SamplesOf(sound), (Samples{1, 2, 3}));
 }
 
+TEST(sound_edit, TimesAtTheGreatestRatesDoNotOverflow)
+{
+    constexpr long greatest = 9223372036854775807;
+    KvoSound trimmed = MonoSound({1, 2, 3}, greatest);
+    KvoSound lowest = MonoSound({1, 2, 3}, -greatest - 1);
+    KvoSound pasted = MonoSound({1, 2, 3}, greatest);
+    KvoSound other = MonoSound({7}, greatest);
+
+    trimmed.Trim(Seconds(0), Seconds(1));
+    lowest.Trim(Seconds(-1), Seconds(0));
+    pasted.Insert(&other, KvoTime::FOREVER);
+
+    EXPECT_EQ(SamplesOf(trimmed), (Samples{1, 2, 3}));
+    EXPECT_EQ(lowest.samples, nullptr); // its times run backward
+    EXPECT_EQ(SamplesOf(pasted), (Samples{1, 2, 3}));
+    EXPECT_EQ(trimmed.Extract(Seconds(1), Seconds(2)), nullptr);
+}
+
 // --- insert
 // --------------------------------------------------------------------
 
@@ -457,6 +477,105 @@ TEST(sound_edit, FractionsOfFramesDoNotCompile)
     EXPECT_FALSE((Extractable<double, double>));
     EXPECT_FALSE((Extractable<int, float>));
     EXPECT_FALSE((Extractable<double, int>));
+}
+
+// --- all edits against a model
+// -------------------------------------------------
+
+/// The frames from `first` to `last` of a model, zeros outside it.
+Frames SpanOf(const Frames& frames, int first, int last)
+{
+    Frames span;
+    for (int i = first; i <= last; ++i)
+        span.push_back(i >= 0 && i < static_cast<int>(frames.size())
+                           ? frames[static_cast<std::size_t>(i)]
+                           : std::pair(0, 0));
+    return span;
+}
+
+/// Lays frames over others, from `at` on; before 0 the others move back.
+Frames Laid(Frames under, const Frames& over, int at)
+{
+    if (at < 0) {
+        under = SpanOf(under, at, static_cast<int>(under.size()) - 1);
+        at = 0;
+    }
+    const auto begin = static_cast<std::size_t>(at);
+    under.resize(std::max(under.size(), begin + over.size()));
+    std::copy(over.begin(), over.end(), under.begin() + at);
+    return under;
+}
+
+Frames Turned(Frames frames)
+{
+    std::reverse(frames.begin(), frames.end());
+    for (auto& [left, right] : frames)
+        std::swap(left, right);
+    return frames;
+}
+
+TEST(sound_edit, ThousandsOfEditsGiveTheSamplesOfAModel)
+{
+    std::mt19937 random(83);
+    auto number = [&](int least, int most) {
+        return least + static_cast<int>(
+                           random() % static_cast<unsigned>(most - least + 1));
+    };
+    auto new_frames = [&](int count, bool stereo) {
+        Frames frames;
+        for (int i = 0; i < count; ++i) {
+            const int left = number(-32768, 32767);
+            frames.push_back({left, stereo ? number(-32768, 32767) : left});
+        }
+        return frames;
+    };
+    auto sound_of = [](const Frames& frames, bool stereo) {
+        KvoSound sound = StereoSound(frames, 6000);
+        if (!stereo)
+            sound.Mono(1);
+        return sound;
+    };
+    for (int start = 0; start < 200; ++start) {
+        const bool stereo = start % 2;
+        Frames model = new_frames(number(1, 30), stereo);
+        KvoSound sound = sound_of(model, stereo);
+        for (int step = 0; step < 20 && !model.empty(); ++step) {
+            const int length = static_cast<int>(model.size());
+            const int first = number(-3, length + 1);
+            const int last = number(-4, length + 4);
+            const Frames other = new_frames(number(1, 12), stereo);
+            KvoSound other_sound = sound_of(other, stereo);
+            switch (number(0, 5)) {
+            case 0:
+                sound.Trim(Tick(first), Tick(last));
+                model = SpanOf(model, first, std::min(last, length - 1));
+                break;
+            case 1:
+                sound.Snip(Tick(first), Tick(last));
+                model = SpanOf(model, first, last);
+                break;
+            case 2:
+                sound.Insert(&other_sound, Tick(first));
+                model = Laid(model, other, first);
+                break;
+            case 3:
+                sound = sound + other_sound;
+                model.insert(model.end(), other.begin(), other.end());
+                break;
+            case 4:
+                sound.Reverse();
+                model = Turned(model);
+                break;
+            default:
+                sound.Stereo(nullptr);
+                if (!stereo)
+                    sound.Mono(number(0, 2));
+                break;
+            }
+            ASSERT_EQ(sound.frames, static_cast<long>(model.size()));
+            ASSERT_EQ(SamplesOf(sound), SamplesOf(sound_of(model, stereo)));
+        }
+    }
 }
 
 } // namespace

@@ -588,23 +588,26 @@ TEST(sound_files, FilesAreClosed)
     }
 }
 
-TEST(sound_files, ALengthThatNoFileCouldHoldLeavesNoFramesInAChild)
+TEST(sound_files, LengthsThatNoFileCouldHoldLeaveNoFramesInAChild)
 {
-    // A FLAC file that claims 2^31 - 1 frames and holds none: the marker, then
-    // one block that describes a mono sound of 16 bits at 8000 hertz.
-    const std::string file =
-        "fLaC" + ByteString({0x80, 0,    0,    34,   0x10, 0,   0x10, 0,
-                             0,    0,    0,    0,    0,    0,   0x01, 0xF4,
-                             0x00, 0xF0, 0x7F, 0xFF, 0xFF, 0xFF}) +
-        std::string(16, '\0');
-    RunInAChild([&] {
-        const Loaded loaded = Load(file, "a.flac");
+    // A FLAC file that claims some frames and holds none: the marker, then
+    // one block that describes a mono sound of 16 bits at 8000 hertz. Of the
+    // numbers, the last is the greatest; memory would do for the others.
+    for (std::uint32_t claimed : {400000U, 100000000U, 0x7FFFFFFFU}) {
+        const std::string file =
+            "fLaC" +
+            ByteString({0x80, 0, 0, 34, 0x10, 0, 0x10, 0, 0, 0, 0, 0, 0, 0,
+                        0x01, 0xF4, 0x00, 0xF0}) +
+            BigEndian32(claimed) + std::string(16, '\0');
+        RunInAChild([&] {
+            const Loaded loaded = Load(file, "a.flac");
 
-        EXPECT_EQ(loaded.sound.frames, 0);
-        EXPECT_EQ(loaded.sound.samples, nullptr);
-        EXPECT_EQ(loaded.reports, "");
-        EXPECT_EQ(loaded.sound.rate, 8000);
-    });
+            EXPECT_EQ(loaded.sound.frames, 0);
+            EXPECT_EQ(loaded.sound.samples, nullptr);
+            EXPECT_EQ(loaded.reports, "");
+            EXPECT_EQ(loaded.sound.rate, 8000);
+        });
+    }
 }
 
 TEST(sound_files, AnyByteMayBeWrong)

@@ -54,7 +54,8 @@ public:
     bool is_special_file(const char* path) override
     {
         struct stat about;
-        return ::stat(path, &about) == 0 && !S_ISREG(about.st_mode);
+        return ::stat(path, &about) == 0 && !S_ISREG(about.st_mode) &&
+               !S_ISDIR(about.st_mode);
     }
 
     bool list_directory(const char* path, bool (*wanted)(const char* name),

@@ -3,6 +3,7 @@
 #if defined(__x86_64__) || defined(__i386__)
 
 #include "platform/unpack_rows.h"
+#include "platform/x86/processor.h"
 
 #include <bit>
 #include <immintrin.h>
@@ -107,15 +108,46 @@ struct Columns
              _mm256_unpackhi_epi64(high01, high23)}};
 }
 
+/// Words that are picked together, and the words before the last of them that
+/// they may come from without being fetched one by one.
 constexpr std::size_t picked_words = 8;
+constexpr int window_words = 16;
 
-[[gnu::target("avx2")]] __m256i pick_block(const std::uint32_t* words,
-                                           __m256i places)
+[[gnu::target("avx2")]] __m256i fetch_block(const std::uint32_t* words,
+                                            __m256i places)
 {
     // Starting from no words at all, nothing older is waited for.
     return _mm256_mask_i32gather_epi32(
         _mm256_setzero_si256(), reinterpret_cast<const int*>(words), places,
         _mm256_set1_epi32(-1), sizeof *words);
+}
+
+/// Picks out of the window that ends with the last of these places.
+[[gnu::target("avx2")]] __m256i pick_in_window(const std::uint32_t* window,
+                                               const int* places)
+{
+    const __m256i last =
+        _mm256_broadcastd_epi32(_mm_loadu_si32(places + picked_words - 1));
+    const __m256i in_window =
+        _mm256_add_epi32(_mm256_sub_epi32(load(places), last),
+                         _mm256_set1_epi32(window_words - 1));
+    const __m256i low = _mm256_permutevar8x32_epi32(load(window), in_window);
+    const __m256i high =
+        _mm256_permutevar8x32_epi32(load(window + window_words / 2), in_window);
+    // Bit 3 of the place says which half; as the sign it chooses.
+    const __m256i half = _mm256_slli_epi32(in_window, 28);
+    return _mm256_castps_si256(_mm256_blendv_ps(_mm256_castsi256_ps(low),
+                                                _mm256_castsi256_ps(high),
+                                                _mm256_castsi256_ps(half)));
+}
+
+[[gnu::target("avx2")]] __m256i pick_block(const std::uint32_t* words,
+                                           const int* places)
+{
+    const int start = places[picked_words - 1] - (window_words - 1);
+    return start < 0 || places[0] < start
+               ? fetch_block(words, load(places))
+               : pick_in_window(words + start, places);
 }
 
 /// Pixels that are averaged together, and registers for their values: three a
@@ -244,12 +276,31 @@ struct Avx2Wide
     }
 };
 
-struct InstalledLanes final : Avx2PixelLanes
-{};
+/// What it says of the operations is said where they are first declared.
+class Avx2PixelLanes final : public PixelLanes
+{
+public:
+    const char* name() const override;
+    void join(const unsigned char* const (&bytes)[4], std::uint32_t* words,
+              std::size_t count) const override;
+    bool unpack(const PackedRow (&rows)[4], Packets packets,
+                const Joining& beside) const override;
+    void split(const std::uint32_t* words, unsigned char* const (&bytes)[4],
+               std::size_t count) const override;
+    std::size_t find_three_equal(const unsigned char* bytes,
+                                 std::size_t count) const override;
+    std::size_t count_equal(const unsigned char* bytes,
+                            std::size_t count) const override;
+    void turn(const std::uint32_t* words, std::size_t stride,
+              std::uint32_t* columns,
+              std::size_t columns_stride) const override;
+    void pick(const std::uint32_t* words, const int* places,
+              std::uint32_t* picked, std::size_t count) const override;
+    void average(const Average& lines, std::uint32_t* averages,
+                 std::size_t count) const override;
+};
 
-constinit const InstalledLanes avx2_lanes;
-
-} // namespace
+constinit const Avx2PixelLanes avx2_lanes;
 
 const char* Avx2PixelLanes::name() const
 {
@@ -335,7 +386,7 @@ Avx2PixelLanes::turn(const std::uint32_t* words, std::size_t stride,
 {
     std::size_t at = 0;
     for (; at + picked_words <= count; at += picked_words)
-        store(picked + at, pick_block(words, load(places + at)));
+        store(picked + at, pick_block(words, places + at));
     PixelLanes::pick(words, places + at, picked + at, count - at);
 }
 
@@ -356,10 +407,11 @@ Avx2PixelLanes::turn(const std::uint32_t* words, std::size_t stride,
     return unpack_rows<Avx2Wide>(*this, rows, packets, beside);
 }
 
+} // namespace
+
 const PixelLanes* avx2_pixel_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    return __builtin_cpu_supports("avx2") ? &avx2_lanes : nullptr;
+    return processor_has_avx2() ? &avx2_lanes : nullptr;
 }
 
 } // namespace zt_platform

@@ -2,6 +2,8 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
+#include "platform/x86/processor.h"
+
 #include <immintrin.h>
 
 // AVX, not AVX2 and above: processors of that kind can fuse a product with a
@@ -177,8 +179,7 @@ constinit const AvxPointLanes avx_lanes;
 
 const PointLanes* avx_point_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    return __builtin_cpu_supports("avx") ? &avx_lanes : nullptr;
+    return processor_has_avx() ? &avx_lanes : nullptr;
 }
 
 } // namespace zt_platform

@@ -2,6 +2,7 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
+#include "platform/x86/processor.h"
 #include "platform/x86/sum_units.h"
 
 #include <algorithm>
@@ -541,8 +542,7 @@ Avx2SampleLanes::to_big_bytes(const short* samples, unsigned char* bytes,
 
 const SampleLanes* avx2_sample_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    return __builtin_cpu_supports("avx2") ? &avx2_lanes : nullptr;
+    return processor_has_avx2() ? &avx2_lanes : nullptr;
 }
 
 } // namespace zt_platform

@@ -4,9 +4,8 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
-#include "platform/x86/sum_units.h"
+#include "platform/x86/processor.h"
 
-#include <algorithm>
 #include <immintrin.h>
 
 #if !defined(__clang__)
@@ -32,53 +31,6 @@ constexpr std::size_t half = 16;  ///< Samples as numbers of a register.
 {
     return _mm512_cvtepi32_ps(_mm512_cvtepi16_epi32(
         _mm256_loadu_si256(reinterpret_cast<const __m256i*>(samples))));
-}
-
-/// Squares of samples in units, as with the narrower registers.
-struct Squares
-{
-    static constexpr std::size_t count = 64;
-
-    bool has_tie;
-    std::int32_t total;
-};
-
-[[gnu::target("avx512f,avx512bw")]] Squares squares_of(const short* samples,
-                                                       __m512 scale)
-{
-    const __m512 half_unit = _mm512_set1_ps(0.5f);
-    __m512i total = _mm512_setzero_si512();
-    __mmask16 ties = 0;
-    for (std::size_t i = 0; i < Squares::count; i += half) {
-        const __m512 value = numbers_at(samples + i);
-        const __m512 square = _mm512_mul_ps(_mm512_mul_ps(value, value), scale);
-        const __m512i units = _mm512_cvtps_epi32(square);
-        const __m512 rest =
-            _mm512_abs_ps(_mm512_sub_ps(square, _mm512_cvtepi32_ps(units)));
-        ties = static_cast<__mmask16>(
-            ties | _mm512_cmp_ps_mask(rest, half_unit, _CMP_EQ_OQ));
-        total = _mm512_add_epi32(total, units);
-    }
-    return {ties != 0, _mm512_reduce_add_epi32(total)};
-}
-
-/// Adds up squares as long as the sum keeps its exponent and no square is
-/// half-way between two units.
-///
-/// Returns: how many samples were taken, whole blocks of them.
-[[gnu::target("avx512f,avx512bw")]] std::size_t
-add_plain_squares(const short* samples, std::size_t count, float& sum)
-{
-    SumUnits units(sum);
-    const __m512 scale = _mm512_set1_ps(units.square_scale());
-    std::size_t at = 0;
-    for (; at + Squares::count <= count; at += Squares::count) {
-        const Squares squares = squares_of(samples + at, scale);
-        if (squares.has_tie || !units.add(squares.total))
-            break;
-    }
-    sum = units.sum();
-    return at;
 }
 
 /// Gives the numbers of the words that have this many bits below them in each
@@ -154,49 +106,6 @@ public:
         Avx2SampleLanes::weigh(now, before, to, left, now_factor,
                                before_factor);
     }
-
-    [[gnu::target("avx512f,avx512bw")]] Range
-    range(const short* samples, std::size_t count) const override
-    {
-        constexpr std::size_t lanes = 4;
-        if (count < lanes * block)
-            return Avx2SampleLanes::range(samples, count);
-        __m512i least[lanes];
-        __m512i largest[lanes];
-        for (std::size_t i = 0; i < lanes; ++i)
-            least[i] = largest[i] = load(samples + i * block);
-        std::size_t at = lanes * block;
-        for (; at + lanes * block <= count; at += lanes * block)
-            for (std::size_t i = 0; i < lanes; ++i) {
-                const __m512i here = load(samples + at + i * block);
-                least[i] = _mm512_min_epi16(least[i], here);
-                largest[i] = _mm512_max_epi16(largest[i], here);
-            }
-        // The last blocks once more, now up to the end.
-        short ends[2 * lanes * block];
-        for (std::size_t i = 0; i < lanes; ++i) {
-            const __m512i last = load(samples + count - (i + 1) * block);
-            _mm512_storeu_si512(ends + 2 * i * block,
-                                _mm512_min_epi16(least[i], last));
-            _mm512_storeu_si512(ends + (2 * i + 1) * block,
-                                _mm512_max_epi16(largest[i], last));
-        }
-        return Avx2SampleLanes::range(ends, 2 * lanes * block);
-    }
-
-    float sum_of_squares(const short* samples, std::size_t count,
-                         float sum) const override
-    {
-        std::size_t at = 0;
-        while (count - at >= Squares::count) {
-            if (sum >= SumUnits::least_sum)
-                at += add_plain_squares(samples + at, count - at, sum);
-            const std::size_t next = std::min(Squares::count, count - at);
-            sum = Avx2SampleLanes::sum_of_squares(samples + at, next, sum);
-            at += next;
-        }
-        return Avx2SampleLanes::sum_of_squares(samples + at, count - at, sum);
-    }
 };
 
 constinit const Avx512SampleLanes avx512_lanes;
@@ -205,11 +114,8 @@ constinit const Avx512SampleLanes avx512_lanes;
 
 const SampleLanes* avx512_sample_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    return __builtin_cpu_supports("avx512f") &&
-                   __builtin_cpu_supports("avx512bw") && avx2_sample_lanes()
-               ? &avx512_lanes
-               : nullptr;
+    return processor_has_avx512() && avx2_sample_lanes() ? &avx512_lanes
+                                                         : nullptr;
 }
 
 } // namespace zt_platform

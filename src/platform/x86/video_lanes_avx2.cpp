@@ -2,6 +2,8 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
+#include "platform/x86/processor.h"
+
 #include <immintrin.h>
 
 // Fractions carried from sum to sum are a running sum modulo 65536 of the
@@ -388,8 +390,7 @@ constinit const Avx2VideoLanes avx2_lanes;
 
 const VideoLanes* avx2_video_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    return __builtin_cpu_supports("avx2") ? &avx2_lanes : nullptr;
+    return processor_has_avx2() ? &avx2_lanes : nullptr;
 }
 
 } // namespace zt_platform

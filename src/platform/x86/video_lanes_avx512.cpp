@@ -2,6 +2,7 @@
 
 #if defined(__x86_64__) || defined(__i386__)
 
+#include "platform/x86/processor.h"
 #include "platform/x86/video_lanes_avx2.h"
 
 // The compiler's own header has variables that are meant to be undefined.
@@ -392,12 +393,8 @@ constinit const Avx512VideoLanes avx512_lanes;
 
 const VideoLanes* avx512_video_lanes()
 {
-    __builtin_cpu_init(); // Static objects may ask before it was done.
-    const bool all = __builtin_cpu_supports("avx512f") &&
-                     __builtin_cpu_supports("avx512bw") &&
-                     __builtin_cpu_supports("avx512vl") &&
-                     __builtin_cpu_supports("avx512vnni");
-    return all && avx2_video_lanes() ? &avx512_lanes : nullptr;
+    return processor_has_avx512_vnni() && avx2_video_lanes() ? &avx512_lanes
+                                                             : nullptr;
 }
 
 } // namespace zt_platform
