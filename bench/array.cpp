@@ -96,8 +96,6 @@ void SumInts(benchmark::State& state)
     state.SetItemsProcessed(state.iterations() * count);
 }
 
-BENCHMARK(AppendInts)->Name("array_append/ours")->Arg(10000000);
-BENCHMARK(AppendIntsToVector)->Name("array_append/std::vector")->Arg(10000000);
 BENCHMARK(AppendInts)
     ->Name("curve/array_append/ours")
     ->RangeMultiplier(10)

@@ -5,7 +5,6 @@
 
 #include <cstdio>
 #include <cstdlib>
-#include <ctime>
 #include <dlfcn.h>
 #include <filesystem>
 #include <fstream>
@@ -13,6 +12,8 @@
 #include <string>
 #include <sys/wait.h>
 #include <unistd.h>
+
+#include "in_a_child.h"
 
 namespace {
 
@@ -25,34 +26,12 @@ void Require(bool done, const char* what)
     std::exit(1);
 }
 
-double Seconds()
-{
-    timespec now = {};
-    clock_gettime(CLOCK_MONOTONIC, &now);
-    return static_cast<double>(now.tv_sec) +
-           static_cast<double>(now.tv_nsec) * 1e-9;
-}
-
 /// Loads the library in a child, since a process does so once; this one has
 /// the language's own library already, as any host has.
 double SecondsOfOneLoad()
 {
-    int ends[2];
-    Require(pipe(ends) == 0, "pipe");
-    const pid_t child = fork();
-    if (child == 0) {
-        const double begin = Seconds();
-        void* const library = dlopen(ZT_LIBRARY, RTLD_NOW);
-        const double spent = library ? Seconds() - begin : 0;
-        _exit(write(ends[1], &spent, sizeof spent) == sizeof spent ? 0 : 1);
-    }
-    double spent = 0;
-    const bool read_whole = read(ends[0], &spent, sizeof spent) == sizeof spent;
-    close(ends[0]);
-    close(ends[1]);
-    waitpid(child, nullptr, 0);
-    Require(read_whole && spent > 0, "library");
-    return spent;
+    return SecondsInAChild(
+        [] { return dlopen(ZT_LIBRARY, RTLD_NOW) != nullptr; });
 }
 
 void Load(benchmark::State& state)
