@@ -70,7 +70,6 @@ private:
 char* PlainText::compose(const char* format, va_list arguments)
 {
     bool fits = true;
-    // NOLINTBEGIN(clang-analyzer-valist.Uninitialized): the caller's
     for (; fits && *format != '\0'; ++format) {
         if (*format != '%') {
             fits = put(*format);
@@ -94,7 +93,6 @@ char* PlainText::compose(const char* format, va_list arguments)
         else
             return nullptr;
     }
-    // NOLINTEND(clang-analyzer-valist.Uninitialized)
     *next = '\0';
     return fits ? next : nullptr;
 }
@@ -127,7 +125,6 @@ void zt_core::FormattedText::let_the_system(std::size_t prefix,
 {
     va_list again;
     va_copy(again, arguments);
-    // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): the caller's
     const int needed = std::vsnprintf(local + prefix, sizeof local - prefix,
                                       format, arguments);
     const std::size_t bytes =
@@ -145,7 +142,6 @@ void zt_core::FormattedText::let_the_system(std::size_t prefix,
     if (needed < 0)
         std::snprintf(begin, room - prefix, "%s", format);
     else if (longer)
-        // NOLINTNEXTLINE(clang-analyzer-valist.Uninitialized): the caller's
         std::vsnprintf(begin, room - prefix, format, again);
     va_end(again);
 }

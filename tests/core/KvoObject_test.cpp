@@ -10,6 +10,7 @@
 #include <gtest/gtest.h>
 
 #include "support/FailingMemory.h"
+#include "support/SlotOf.h"
 
 namespace {
 
@@ -42,16 +43,6 @@ std::string Written(KvoObject& object)
     std::ostringstream out;
     object.Write(out);
     return out.str();
-}
-
-/// The place of a virtual operation in the table that plug-ins call through.
-template <class Operation>
-std::ptrdiff_t SlotOf(Operation operation)
-{
-    std::ptrdiff_t word = 0;
-    static_assert(sizeof operation == 2 * sizeof word);
-    std::memcpy(&word, &operation, sizeof word);
-    return (word - 1) / static_cast<std::ptrdiff_t>(sizeof(void*));
 }
 
 } // namespace

@@ -11,6 +11,7 @@
 #include "diag/Reports.h"
 #include "support/ErrorTrap.h"
 #include "support/FailingMemory.h"
+#include "support/SlotOf.h"
 #include "support/ThrowingStderr.h"
 
 namespace {
@@ -53,15 +54,6 @@ public:
     static inline int deleted = 0;
     static inline bool tells = false;
 };
-
-template <class Operation>
-std::ptrdiff_t SlotOf(Operation operation)
-{
-    std::ptrdiff_t word = 0;
-    static_assert(sizeof operation == 2 * sizeof word);
-    std::memcpy(&word, &operation, sizeof word);
-    return (word - 1) / static_cast<std::ptrdiff_t>(sizeof(void*));
-}
 
 } // namespace
 

@@ -10,6 +10,7 @@
 
 #include "ZT/util.h"
 #include "env/plugin_tests.h"
+#include "support/SlotOf.h"
 
 namespace {
 
@@ -42,16 +43,6 @@ bool MatchesOlder(const char* catalog_id, const char* plug_id)
     TestCatalog catalog(catalog_id);
     catalog.exact_version = 0;
     return catalog.plug_id_matches(plug_id) != 0;
-}
-
-/// Gives the slot of a virtual operation in its class's table.
-template <class Operation>
-std::ptrdiff_t SlotOf(Operation operation)
-{
-    std::ptrdiff_t words[2] = {};
-    static_assert(sizeof(operation) == sizeof(words));
-    std::memcpy(words, &operation, sizeof(words));
-    return words[0] / static_cast<std::ptrdiff_t>(sizeof(void*));
 }
 
 constexpr int most = std::numeric_limits<int>::max();

@@ -15,6 +15,7 @@
 #include "support/ErrorTrap.h"
 #include "support/FailingMalloc.h"
 #include "support/FailingMemory.h"
+#include "support/SlotOf.h"
 #include "support/TempDir.h"
 
 namespace {
@@ -36,16 +37,6 @@ static_assert(std::has_virtual_destructor_v<KvoRecognizer>);
 static_assert(std::is_abstract_v<KvoRecognizerFactory>);
 static_assert(std::is_base_of_v<KvoObject, KvoRecognizerFactory>);
 static_assert(std::is_base_of_v<ZtPlugCatalog, KvoRecognizerCatalog>);
-
-/// Gives the slot of a virtual operation in its class's table.
-template <class Operation>
-std::ptrdiff_t SlotOf(Operation operation)
-{
-    std::ptrdiff_t words[2] = {};
-    static_assert(sizeof(operation) == sizeof(words));
-    std::memcpy(words, &operation, sizeof(words));
-    return words[0] / static_cast<std::ptrdiff_t>(sizeof(void*));
-}
 
 class NamedRecognizer : public KvoRecognizer
 {

@@ -75,12 +75,20 @@ def check_pages_and_examples_are_listed(root):
                     yield f"{listing}: does not list {path.name}"
 
 
+def check_kept_interface_has_no_place(root):
+    """What the interface is compared with says nothing of where it was made."""
+    for path in sorted((root / "abi").glob("*.abi")):
+        if "path='/" in path.read_text(encoding="utf-8"):
+            yield f"abi/{path.name}: names files of one machine"
+
+
 def main():
     root = pathlib.Path(sys.argv[1])
     faults = [fault
               for check in (check_sizes, check_guards, check_rooms,
                             check_paths_in_readme, check_program_in_readme,
-                            check_pages_and_examples_are_listed)
+                            check_pages_and_examples_are_listed,
+                            check_kept_interface_has_no_place)
               for fault in check(root)]
     print("\n".join(faults) or "house: all well")
     return 1 if faults else 0

@@ -36,7 +36,7 @@ std::string DifferenceWhenSaved(const KvoSound& sound)
     char name[] = "/tmp/zt_sound_XXXXXX";
     const int handle = mkstemp(name);
     if (handle < 0)
-        return "";
+        return "there is no file to save to\n";
     close(handle);
     sound.Save(name);
     std::string bytes;

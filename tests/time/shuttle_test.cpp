@@ -16,18 +16,11 @@
 
 #include "support/PrintTime.h"
 #include "support/RecordingShuttle.h"
+#include "support/SlotOf.h"
 
 namespace {
 using Lines = std::vector<std::string>;
 
-/// Where an operation stands in the table of virtual operations.
-template <class Member>
-std::ptrdiff_t SlotOf(Member member)
-{
-    std::ptrdiff_t slot = 0;
-    std::memcpy(&slot, &member, sizeof slot);
-    return slot;
-}
 } // namespace
 
 TEST(ZtShuttle, NumbersOfStatesAndModes)
